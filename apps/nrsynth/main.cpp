@@ -3,15 +3,36 @@
 
 #include <iostream>
 
+#include "commands.h"
 #include "version.h"
 
 int main(int argc, char** argv) {
     CLI::App app{"nrsynth: 5G NR baseband waveform synthesis (3GPP TS 38.211/212/213/214)"};
     app.set_version_flag("--version", Orvalis_NR::libraryVersion());
-    app.require_subcommand(0, 1);
+    app.require_subcommand(1);
+
+    std::string wave;
+    std::string defaultsType;
+    auto* show = app.add_subcommand(
+        "show", "Print the effective settings tree of WAVE.json (every setting, defaults filled in)");
+    show->add_option("wave", wave, "waveform document (JSON)");
+    show->add_option("--defaults", defaultsType,
+                     "print a default instance of a model type instead, e.g. NRDLSCH");
+
+    auto* validate = app.add_subcommand(
+        "validate", "Report unknown keys and values of the wrong kind in WAVE.json");
+    validate->add_option("wave", wave, "waveform document (JSON)")->required();
+
     CLI11_PARSE(app, argc, argv);
-    if (app.get_subcommands().empty()) {
-        std::cout << app.help();
+
+    if (*show) {
+        if (!defaultsType.empty()) return nrsynth_cli::showDefaults(defaultsType);
+        if (wave.empty()) {
+            std::cerr << "nrsynth show: give WAVE.json or --defaults TYPE\n";
+            return 1;
+        }
+        return nrsynth_cli::showDocument(wave);
     }
+    if (*validate) return nrsynth_cli::validateDocument(wave);
     return 0;
 }

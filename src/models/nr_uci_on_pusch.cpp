@@ -1,0 +1,12 @@
+#include "models/nr_uci_on_pusch.h"
+
+namespace Models::Nr5g {
+
+NRUCIonPUSCH::NRUCIonPUSCH() : ModelBase("NRUCIonPUSCH") {
+    init(Enabled)->setValue(false);
+    init(PayloadData);
+    init(PayloadSize)->setValue(10);
+    init(BetaOffsetIndex)->setValue(0);
+}
+
+}  // namespace Models::Nr5g

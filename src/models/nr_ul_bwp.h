@@ -1,0 +1,49 @@
+#pragma once
+// Settings model NRULBWP.
+
+#include <memory>
+#include <string>
+
+#include "framework/enum_setting.h"
+#include "framework/model_base.h"
+#include "framework/sub_setting.h"
+#include "framework/value_setting.h"
+#include "models/enums.h"
+
+namespace Models::Nr5g {
+
+using Orvalis::Tessaline::BoolSetting;
+using Orvalis::Tessaline::DoubleSetting;
+using Orvalis::Tessaline::EnumSetting;
+using Orvalis::Tessaline::Int32Setting;
+using Orvalis::Tessaline::ModelBase;
+using Orvalis::Tessaline::ModelCollection;
+using Orvalis::Tessaline::StringSetting;
+using Orvalis::Tessaline::SubSetting;
+
+class NRULBWP : public ModelBase {
+    TESSALINE_MODEL_TYPE(NRULBWP)
+  public:
+    NRULBWP();
+
+    /// Identifier.
+    std::shared_ptr<Int32Setting> ID = std::make_shared<Int32Setting>("ID");
+    /// Display name, by which other settings refer to this item.
+    std::shared_ptr<StringSetting> Name = std::make_shared<StringSetting>("Name");
+    /// Numerology.
+    std::shared_ptr<EnumSetting<::Models::Nr5g::Numerology>> Numerology =
+        std::make_shared<EnumSetting<::Models::Nr5g::Numerology>>("Numerology");
+    /// Numerology as the number µ.
+    std::shared_ptr<Int32Setting> Mu = std::make_shared<Int32Setting>("Mu");
+    /// Cyclic prefix.
+    std::shared_ptr<EnumSetting<::Models::Nr5g::CyclicPrefixType>> CPType =
+        std::make_shared<EnumSetting<::Models::Nr5g::CyclicPrefixType>>("CPType");
+    /// First resource block, relative to the bandwidth part.
+    std::shared_ptr<Int32Setting> RBOffset = std::make_shared<Int32Setting>("RBOffset");
+    /// Number of resource blocks.
+    std::shared_ptr<Int32Setting> RBNumber = std::make_shared<Int32Setting>("RBNumber");
+    /// Host validation state.
+    std::shared_ptr<BoolSetting> Valid = std::make_shared<BoolSetting>("Valid");
+};
+
+}  // namespace Models::Nr5g

@@ -1,0 +1,47 @@
+#pragma once
+// Settings model NRUplink.
+
+#include <memory>
+#include <string>
+
+#include "framework/enum_setting.h"
+#include "framework/model_base.h"
+#include "framework/sub_setting.h"
+#include "framework/value_setting.h"
+#include "models/enums.h"
+#include "models/nr_srs.h"
+#include "models/nr_uci.h"
+#include "models/nr_ul_bwp.h"
+#include "models/nr_ulsch.h"
+
+namespace Models::Nr5g {
+
+using Orvalis::Tessaline::BoolSetting;
+using Orvalis::Tessaline::DoubleSetting;
+using Orvalis::Tessaline::EnumSetting;
+using Orvalis::Tessaline::Int32Setting;
+using Orvalis::Tessaline::ModelBase;
+using Orvalis::Tessaline::ModelCollection;
+using Orvalis::Tessaline::StringSetting;
+using Orvalis::Tessaline::SubSetting;
+
+class NRUplink : public ModelBase {
+    TESSALINE_MODEL_TYPE(NRUplink)
+  public:
+    NRUplink();
+
+    /// The PUCCHs.
+    std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRUCI>>> UCI =
+        std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRUCI>>>("UCI");
+    /// The PUSCHs.
+    std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRULSCH>>> ULSCH =
+        std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRULSCH>>>("ULSCH");
+    /// The bandwidth parts.
+    std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRULBWP>>> BWP =
+        std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRULBWP>>>("BWP");
+    /// The SRSs.
+    std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRSRS>>> SRSs =
+        std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRSRS>>>("SRSs");
+};
+
+}  // namespace Models::Nr5g
