@@ -37,16 +37,16 @@ class JsonReader {
     explicit JsonReader(JsonSerializer& owner) : owner_(owner) {}
 
     void fillModel(const json& value, IModel& model, const std::string& path) {
+        if (model.isCollection()) {
+            fillCollection(value, static_cast<ModelCollectionBase&>(model), path);
+            return;
+        }
         if (!value.is_object()) {
             fail(path, "expected an object of type " + model.getFullTypeName() + ", got " +
                            kindOf(value));
             return;
         }
         if (!checkType(value, model, path)) return;
-        if (model.isCollection()) {
-            fillCollection(value, static_cast<ModelCollectionBase&>(model), path);
-            return;
-        }
         auto* base = dynamic_cast<ModelBase*>(&model);
         if (!base) return;
         for (const auto& [key, item] : value.items()) {
@@ -246,7 +246,7 @@ ordered_json toJson(const IModel& model) {
 }  // namespace
 
 std::string JsonSerializer::serialize(const IModel& model, int indent) {
-    return toJson(model).dump(indent);
+    return toJson(model).dump(indent, ' ', false, ordered_json::error_handler_t::replace);
 }
 
 }  // namespace Orvalis::Tessaline
