@@ -1,0 +1,55 @@
+#!/usr/bin/env bash
+# Drives the command-line tool as a user does and checks outputs and exit codes.
+set -u
+cli=$1
+examples=$2
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+failures=0
+check() {  # check NAME CONDITION...
+    local name=$1
+    shift
+    if "$@"; then echo "ok   $name"; else echo "FAIL $name"; failures=$((failures + 1)); fi
+}
+
+# show: defaults filled in, output reads back to the same output
+echo '{}' > "$work/empty.json"
+"$cli" show "$work/empty.json" > "$work/a.json"; rc=$?
+check "show {} exits 0" test $rc -eq 0
+check "show {} lists root settings" grep -q '"CarrierPowerOffset": -3.52182518111362' "$work/a.json"
+for f in "$examples"/*.json; do
+    "$cli" show "$f" > "$work/first.json"
+    "$cli" show "$work/first.json" > "$work/second.json"
+    check "show $(basename "$f") is a fixed point" cmp -s "$work/first.json" "$work/second.json"
+    "$cli" validate "$f" > /dev/null
+    check "validate $(basename "$f") is clean" test $? -eq 0
+done
+
+# bad documents: exit code 1 and the reader's message
+echo '{"NRCarriers": [{"CellID": "x"}]}' > "$work/bad.json"
+"$cli" show "$work/bad.json" 2> "$work/err.txt" > /dev/null; rc=$?
+check "show of a bad value exits 1" test $rc -eq 1
+check "show names the path" grep -q 'NRCarriers\[0\].CellID: expected an integer, got "x"' "$work/err.txt"
+"$cli" show "$work/missing.json" 2> "$work/err.txt" > /dev/null; rc=$?
+check "show of a missing file exits 1" test $rc -eq 1
+check "show names the missing file" grep -q 'missing.json' "$work/err.txt"
+
+# validate: unknown keys with their path, wrong kinds, exit 1
+echo '{"Colour": 1, "NRCarriers": [{"Downlink": {"Foo": 2}, "CellID": true}]}' > "$work/odd.json"
+"$cli" validate "$work/odd.json" > "$work/out.txt"; rc=$?
+check "validate with problems exits 1" test $rc -eq 1
+check "validate lists an unknown root key" grep -q 'unknown key: Colour' "$work/out.txt"
+check "validate lists a nested unknown key" grep -q 'unknown key: NRCarriers\[0\].Downlink.Foo' "$work/out.txt"
+check "validate lists a wrong kind" grep -q 'NRCarriers\[0\].CellID: expected an integer, got true' "$work/out.txt"
+
+# show --defaults
+"$cli" show --defaults NRDLSCH > "$work/dlsch.json"; rc=$?
+check "show --defaults NRDLSCH exits 0" test $rc -eq 0
+check "show --defaults NRDLSCH prints its defaults" grep -q '"TransportBlockSize": 3200' "$work/dlsch.json"
+"$cli" show --defaults Models.Nr5g.NRMIB > /dev/null
+check "show --defaults takes full type names" test $? -eq 0
+"$cli" show --defaults NoSuchType > /dev/null 2>&1; rc=$?
+check "show --defaults of an unknown type exits 1" test $rc -eq 1
+
+echo "cli: $failures failed"
+exit $((failures > 0))
