@@ -63,6 +63,10 @@ struct EnumCase {
 
 class EnumForms : public ::testing::TestWithParam<EnumCase> {};
 
+void PrintTo(const EnumCase& c, std::ostream* os) {
+    *os << c.json;
+}
+
 TEST_P(EnumForms, NameDisplayNameOrPosition) {
     const std::string doc =
         std::string(R"({"NRCarriers": [{"Downlink": {"DLSCH": [{"Modulation": )") +
@@ -92,6 +96,10 @@ struct ErrorCase {
 };
 
 class ReadErrors : public ::testing::TestWithParam<ErrorCase> {};
+
+void PrintTo(const ErrorCase& c, std::ostream* os) {
+    *os << c.json;
+}
 
 TEST_P(ReadErrors, NameThePathOfTheBadValue) {
     EXPECT_EQ(errorOf(GetParam().json), GetParam().message);
