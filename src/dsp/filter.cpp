@@ -1,0 +1,120 @@
+#include "dsp/filter.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <string>
+
+namespace Orvalis_NR {
+
+void Filter::filter(gsl::span<std::complex<double>> in, gsl::span<std::complex<double>> out) {
+    filter(in.data(), gsl::narrow<int>(in.size()), out.data(), gsl::narrow<int>(out.size()));
+}
+
+void Filter::filter(const double* in, int inLength, double* out, int outLength) {
+    if (inLength != outLength || inLength <= 0 || inLength % 2 != 0)
+        throw std::invalid_argument("inputLength");
+    filter(reinterpret_cast<const std::complex<double>*>(in), inLength / 2,
+           reinterpret_cast<std::complex<double>*>(out), outLength / 2);
+}
+
+BasicFir::BasicFir(std::vector<std::complex<double>> coefficients_)
+    : coefficients(std::move(coefficients_)) {
+    if (coefficients.empty()) throw std::invalid_argument("m_coeff");
+    delayLine.assign(coefficients.size(), {});
+}
+
+void BasicFir::filter(const std::complex<double>* in, int inLength, std::complex<double>* out,
+                      int outLength) {
+    if (inLength != outLength || inLength < 0) throw std::invalid_argument("iqInputLength");
+    if (inLength > 0 && (in == nullptr || out == nullptr))
+        throw std::invalid_argument(in == nullptr ? "in: null pointer" : "out: null pointer");
+    const std::size_t m = coefficients.size();
+    for (int n = 0; n < inLength; ++n) {
+        std::copy(delayLine.begin() + 1, delayLine.end(), delayLine.begin());
+        delayLine[m - 1] = in[n];
+        std::complex<double> sum = 0.0;
+        for (std::size_t i = 0; i < m; ++i) sum += coefficients[m - 1 - i] * delayLine[i];
+        out[n] = sum;
+    }
+}
+
+Fir::Fir(std::shared_ptr<Dft> transform_, std::vector<std::complex<double>> coefficients_)
+    : BasicFir(std::move(coefficients_)), transform(std::move(transform_)) {
+    if (!transform) throw std::invalid_argument("transform: null pointer");
+    if (static_cast<int>(coefficients.size()) > transform->size())
+        throw std::invalid_argument("m_coeff");
+}
+
+void Fir::filter(const std::complex<double>* in, int inLength, std::complex<double>* out,
+                 int outLength) {
+    if (inLength != outLength || inLength <= 0) throw std::invalid_argument("iqInputLength");
+    if (in == nullptr || out == nullptr)
+        throw std::invalid_argument(in == nullptr ? "in: null pointer" : "out: null pointer");
+    const int size = transform->size();
+    const int m = static_cast<int>(coefficients.size());
+    const int length = inLength;
+    if (static_cast<long long>(length) + m - 1 > size) throw std::invalid_argument("dft");
+
+    if (spectrumSize != size || spectrum.size() != static_cast<std::size_t>(size)) {
+        spectrum.assign(static_cast<std::size_t>(size), {});
+        std::copy(coefficients.begin(), coefficients.end(), spectrum.begin());
+        transform->dft(spectrum.data(), spectrum.data());
+        work.assign(static_cast<std::size_t>(size), {});
+        spectrumSize = size;
+    }
+
+    // work = [input | zeros | the M - 1 inputs before this piece]: the circular convolution
+    // then equals the linear one over the first L samples.
+    std::copy(in, in + length, work.begin());
+    std::fill(work.begin() + length, work.end() - (m - 1), std::complex<double>{});
+    std::copy(delayLine.begin() + 1, delayLine.end(), work.end() - (m - 1));
+
+    // New history: the last M inputs, reaching back into the old history for a short piece.
+    if (length >= m) {
+        std::copy(in + length - m, in + length, delayLine.begin());
+    } else {
+        std::copy(delayLine.begin() + length, delayLine.end(), delayLine.begin());
+        std::copy(in, in + length, delayLine.end() - length);
+    }
+
+    transform->dft(work.data(), work.data());
+    for (int i = 0; i < size; ++i) work[i] *= spectrum[i];
+    transform->idft(work.data(), work.data());
+    std::copy(work.begin(), work.begin() + length, out);
+}
+
+BlockFilter::BlockFilter(std::shared_ptr<Filter> inner_, int blockSize_)
+    : inner(std::move(inner_)), blockSize(blockSize_) {
+    if (!inner) throw std::invalid_argument("inner: null pointer");
+    if (blockSize < 1)
+        throw std::invalid_argument("blockSize: must be at least 1, got " +
+                                    std::to_string(blockSize));
+}
+
+void BlockFilter::filter(const std::complex<double>* in, int inLength, std::complex<double>* out,
+                         int outLength) {
+    if (inLength != outLength || inLength <= 0) throw std::invalid_argument("iqInputLength");
+    for (int offset = 0; offset < inLength; offset += blockSize) {
+        const int piece = std::min(blockSize, inLength - offset);
+        inner->filter(in + offset, piece, out + offset, piece);
+    }
+}
+
+int overlapSaveLength(long long needed) {
+    int length = 1;
+    while (length < needed && length < 0x800000) length <<= 1;
+    return length;
+}
+
+std::shared_ptr<BlockFilter> FilterCreator::create(std::vector<std::complex<double>> coefficients,
+                                                   int blockSize) {
+    if (coefficients.empty()) throw std::invalid_argument("coeff");
+    const int count = static_cast<int>(coefficients.size());
+    const int effectiveBlock = std::max(blockSize, count);
+    const int length = overlapSaveLength(static_cast<long long>(effectiveBlock) + count - 1);
+    auto transform = std::make_shared<IppDft>(length);
+    auto fir = std::make_shared<Fir>(std::move(transform), std::move(coefficients));
+    return std::make_shared<BlockFilter>(std::move(fir), effectiveBlock);
+}
+
+}  // namespace Orvalis_NR
