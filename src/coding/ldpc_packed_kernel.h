@@ -1,0 +1,169 @@
+#pragma once
+// Internal to the packed LDPC encoder. The kernels see the plan as plain pointers and use no
+// standard-library templates, because one of them is compiled for AVX2 in a file of its own:
+// anything inline shared with the portable code could otherwise be emitted with AVX2
+// instructions and picked by the linker for machines without them.
+//
+// Bit vectors: bit i of a Z-bit circulant vector is bit (i % 64) of word i / 64. A column
+// buffer holds its vector periodically (bit t = x[t mod Z]) far enough that the cyclic shift
+// rot(x, h)[r] = x[(r + h) mod Z] is a plain unaligned read starting at bit h.
+
+#include <cstdint>
+#include <bit>
+#include <cstddef>
+#include <cstring>
+
+namespace Orvalis_NR::ldpc_detail {
+
+static_assert(std::endian::native == std::endian::little,
+              "the packed kernels read bit vectors as bytes and words alike");
+
+/// One LDPC encoding plan for a (base graph, Z) and its workspace.
+struct PackedPlanView {
+    int z;           // lifting size
+    int kb;          // information columns (22 or 10)
+    int rows;        // base graph rows (46 or 42)
+    int words;       // 64-bit words of one Z-bit vector
+    int paddedWords; // words rounded up to a multiple of 4 (vector width of the AVX2 kernel)
+    int stride;      // 64-bit words of one periodic column buffer
+    int p0Rotation;  // rotation that turns the sum of the four head rows into p0
+    const int* rowBegin;      // rows + 1 offsets into the edge arrays
+    const int* rowInfoEnd;    // per row: end of its information-column edges
+    const int* edgeColumn;    // base column of each edge (< kb + 4)
+    const int* edgeShift;     // its shift, already reduced modulo z
+    const int* stepRow;       // the head rows that give p1, p2, p3, in solving order
+    const int* stepColumn;    // the parity column each of them gives
+    const int* stepRotation;  // rotation undoing the shift of that column in that row
+    std::uint64_t* columns;   // kb + 5 periodic buffers: information, p0..p3, scratch
+    std::uint64_t* packed;    // the K input bits and two spare words
+    std::uint64_t* acc;       // 6 vectors of paddedWords words
+};
+
+bool encodePackedPortable(const PackedPlanView& plan, int* in, int* out);
+bool encodePackedAvx2(const PackedPlanView& plan, int* in, int* out);
+
+namespace {
+
+struct PackScan {
+    bool bad;     // a value other than 0, 1 and -2
+    bool filler;  // a -2 somewhere
+};
+
+inline std::uint64_t load64(const unsigned char* p) {
+    std::uint64_t v;
+    std::memcpy(&v, p, sizeof v);
+    return v;
+}
+
+inline void clearTail(std::uint64_t* v, int z, int words) {
+    if (z % 64) v[z / 64] &= (std::uint64_t{1} << (z % 64)) - 1;
+    for (int w = (z + 63) / 64; w < words; ++w) v[w] = 0;
+}
+
+// z bits of `src` from bit `offset` into v (clean above z).
+inline void extractBits(const std::uint64_t* src, int offset, int z, std::uint64_t* v,
+                        int words) {
+    const int first = offset / 64;
+    const int shift = offset % 64;
+    const int used = (z + 63) / 64;
+    for (int w = 0; w < used; ++w) {
+        const std::uint64_t lo = src[first + w];
+        v[w] = shift ? (lo >> shift) | (src[first + w + 1] << (64 - shift)) : lo;
+    }
+    clearTail(v, z, words);
+}
+
+// Repeats the clean z-bit vector v through the whole column buffer.
+inline void fillPeriodic(std::uint64_t* column, int stride, const std::uint64_t* v, int z) {
+    const int used = (z + 63) / 64;
+    for (int w = 0; w < stride; ++w) column[w] = 0;
+    for (int pos = 0; pos < stride * 64; pos += z) {
+        const int q = pos / 64;
+        const int s = pos % 64;
+        for (int w = 0; w < used && q + w < stride; ++w) {
+            column[q + w] |= v[w] << s;
+            if (s && q + w + 1 < stride) column[q + w + 1] |= v[w] >> (64 - s);
+        }
+    }
+}
+
+// The encoding schedule, shared by the kernels; Ops supplies packing, the row sums of
+// rotated columns and unpacking. Returns false, touching nothing, when the input holds a
+// value other than 0, 1 or -2, or a -2 among the first 2Z bits: those inputs take the list
+// form, which defines what they give.
+template <class Ops>
+bool runPackedPlan(const PackedPlanView& p, int* in, int* out) {
+    const int z = p.z;
+    const int k = p.kb * z;
+    const PackScan scan = Ops::pack(in, k, p.packed);
+    if (scan.bad) return false;
+    if (scan.filler) {
+        for (int i = 0; i < 2 * z; ++i) {
+            if (in[i] == -2) return false;
+        }
+    }
+    // Systematic output, fillers marked; from here on a filler reads as 0 (its packed bit
+    // already is 0, since -2 is even).
+    std::memcpy(out, in + 2 * z, sizeof(int) * static_cast<std::size_t>(k - 2 * z));
+    if (scan.filler) {
+        for (int i = 2 * z; i < k; ++i) {
+            if (in[i] == -2) in[i] = 0;
+        }
+    }
+
+    const auto column = [&](int c) { return p.columns + static_cast<std::size_t>(c) * p.stride; };
+    const auto vec = [&](int i) { return p.acc + static_cast<std::size_t>(i) * p.paddedWords; };
+    std::uint64_t* work = vec(4);
+    std::uint64_t* parity = vec(5);
+    std::uint64_t* scratch = column(p.kb + 4);
+    int* parityOut = out + (p.kb - 2) * z;
+
+    for (int c = 0; c < p.kb; ++c) {
+        extractBits(p.packed, c * z, z, work, p.paddedWords);
+        fillPeriodic(column(c), p.stride, work, z);
+    }
+
+    // Head rows: information part of each, then p0 from their sum.
+    for (int b = 0; b < 4; ++b) {
+        Ops::rowXor(vec(b), p, p.rowBegin[b], p.rowInfoEnd[b]);
+        clearTail(vec(b), z, p.paddedWords);
+    }
+    for (int w = 0; w < p.paddedWords; ++w) work[w] = vec(0)[w] ^ vec(1)[w] ^ vec(2)[w] ^ vec(3)[w];
+    if (p.p0Rotation) {
+        fillPeriodic(scratch, p.stride, work, z);
+        Ops::rotate(parity, scratch, p.p0Rotation, p.paddedWords);
+        clearTail(parity, z, p.paddedWords);
+    } else {
+        std::memcpy(parity, work, sizeof(std::uint64_t) * p.paddedWords);
+    }
+    fillPeriodic(column(p.kb), p.stride, parity, z);
+    Ops::unpack(parity, z, parityOut);
+
+    // p1..p3, each from a head row whose other parity columns are known by then.
+    for (int t = 0; t < 3; ++t) {
+        const int b = p.stepRow[t];
+        const int j = p.stepColumn[t];
+        Ops::rowXor(work, p, p.rowInfoEnd[b], p.rowBegin[b + 1], j);
+        for (int w = 0; w < p.paddedWords; ++w) work[w] ^= vec(b)[w];
+        clearTail(work, z, p.paddedWords);
+        if (p.stepRotation[t]) {
+            fillPeriodic(scratch, p.stride, work, z);
+            Ops::rotate(parity, scratch, p.stepRotation[t], p.paddedWords);
+            clearTail(parity, z, p.paddedWords);
+        } else {
+            std::memcpy(parity, work, sizeof(std::uint64_t) * p.paddedWords);
+        }
+        fillPeriodic(column(j), p.stride, parity, z);
+        Ops::unpack(parity, z, parityOut + (j - p.kb) * z);
+    }
+
+    // Extension rows: one parity block each, from information and head parity columns.
+    for (int b = 4; b < p.rows; ++b) {
+        Ops::rowXor(work, p, p.rowBegin[b], p.rowBegin[b + 1]);
+        Ops::unpack(work, z, parityOut + b * z);
+    }
+    return true;
+}
+
+}  // namespace
+}  // namespace Orvalis_NR::ldpc_detail
