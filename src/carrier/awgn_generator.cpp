@@ -1,0 +1,92 @@
+#include "carrier/awgn_generator.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+#include <random>
+
+#include "dsp/filter.h"
+#include "dsp/sinc_low_pass.h"
+#include "engine/engine_failure.h"
+
+namespace Orvalis_NR {
+
+void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWaveformSettings& waveform, int totalSamples,
+                             int) {
+    settings = &waveform;
+    NR5GCarrierGenerator::settings = &waveform;
+    numberOfAntennas = waveform.NumberOfAntennas->getValue();
+    NR5GCarrierGenerator::numberOfAntennas = numberOfAntennas;
+    const double rate = waveform.SampleRateAuto->getValue();
+    if (!(rate >= 100.0) || !(rate <= 2.0e9))
+        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(rate));
+    const double noiseBandwidth = waveform.NoiseBandwidth->getValue();
+    if (!(noiseBandwidth > 0.0))
+        failWith("NoiseBandwidth must be positive.", "NoiseBandwidth " + std::to_string(noiseBandwidth));
+
+    const double ratio = waveform.CarrierToNoiseRatio->getValue();
+    if (!std::isfinite(ratio))
+        failWith("CarrierToNoiseRatio must be a finite number.", "CarrierToNoiseRatio " + std::to_string(ratio));
+    const double bandwidth = std::min(rate, noiseBandwidth * 1.25);
+    const double x = bandwidth / rate;
+    sigma = waveform.AwgnEnabled->getValue()
+                ? std::sqrt(x) * std::pow(10.0, -waveform.CarrierToNoiseRatio->getValue() / 20.0) / std::sqrt(rate / 15000.0)
+                : 0.0;
+
+    const auto design = Generate_SincLowPass(x, 1024, 1, true);
+    std::vector<std::complex<double>> coefficients(design.begin(), design.end());
+    noiseFilters.clear();
+    for (int a = 0; a < numberOfAntennas; ++a) noiseFilters.push_back(FilterCreator::create(coefficients, 7000));
+
+    frameLength = std::min(static_cast<int>(rate) / 100, totalSamples);
+    const auto rows = static_cast<std::size_t>(std::max(numberOfAntennas, 0));
+    const std::vector<std::complex<double>> zeros(static_cast<std::size_t>(std::max(frameLength, 0)));
+    currentSamples.assign(rows, zeros);
+    previousSamples.assign(rows, zeros);
+    rawNoise.assign(rows, zeros);
+    currentMarkers.assign(rows, std::vector<char>(zeros.size()));
+    previousMarkers.assign(rows, std::vector<char>(zeros.size()));
+    const int lines[4] = {static_cast<int>(waveform.Marker1->getValue()), static_cast<int>(waveform.Marker2->getValue()),
+                          static_cast<int>(waveform.Marker3->getValue()), static_cast<int>(waveform.Marker4->getValue())};
+    setMarkerLines(lines);
+}
+
+void AwgnGenerator::GoAwgn(int frame, int, bool secondPass, bool noiseOnly) {
+    std::mt19937 engine;  // default seed 5489 unless reseeded below
+    // A ratio so high that sigma underflows to 0 means no noise (the distribution needs sigma > 0).
+    std::normal_distribution<double> normal(0.0, sigma > 0.0 ? sigma : 1.0);
+    const double scale = sigma > 0.0 ? 1.0 : 0.0;
+    if (secondPass) {
+        engine.seed(seed);
+    } else if (frame == 0) {
+        seed = static_cast<unsigned int>(std::rand());
+        engine.seed(seed);
+    }
+    // Frames 1 and on of the first pass keep the default seed and so repeat the same noise.
+
+    for (std::size_t a = 0; a < rawNoise.size(); ++a) {
+        auto& raw = rawNoise[a];
+        for (int i = 0; i < frameLength; ++i) {
+            const double inPhase = normal(engine) * scale;
+            const double quadrature = normal(engine) * scale;
+            raw[static_cast<std::size_t>(i)] = {inPhase, quadrature};
+        }
+        previousSamples[a].swap(currentSamples[a]);
+        if (frameLength > 0) noiseFilters[a]->filter(raw.data(), frameLength, currentSamples[a].data(), frameLength);
+    }
+
+    // Frame start (and waveform start in frame 0) on the first sample; RF ALC and blanking on
+    // every sample when the noise is the whole waveform.
+    const int allSamples = noiseOnly ? 12 : 0;
+    const char firstByte = markerByte((frame == 0 ? 3 : 2) | allSamples);
+    const char otherBytes = markerByte(allSamples);
+    for (std::size_t a = 0; a < currentMarkers.size(); ++a) {
+        for (int i = 0; i < frameLength; ++i) {
+            const char byte = i == 0 ? firstByte : otherBytes;
+            currentMarkers[a][static_cast<std::size_t>(i)] |= byte;
+            previousMarkers[a][static_cast<std::size_t>(i)] |= byte;
+        }
+    }
+}
+
+}  // namespace Orvalis_NR

@@ -1,0 +1,91 @@
+// Length of a waveform from frames, subframes and slot cuts, and the per-antenna file names.
+
+#include <gtest/gtest.h>
+
+#include "engine/engine_failure.h"
+#include "engine/nr5g_engine.h"
+#include "models/nr5g_waveform_settings.h"
+
+namespace {
+
+using Models::Nr5g::NR5GWaveformSettings;
+using Models::Nr5g::NRCarrier;
+using Models::Nr5g::Numerology;
+using Orvalis_NR::ComputeWaveformLength;
+
+struct LengthCase {
+    const char* name;
+    double sampleRate;
+    int frames;
+    int subframeOffset;
+    int subframes;
+    Numerology numerology;
+    int slotOffset;
+    int slotCount;
+    int expectedTotal;
+    int expectedStart;
+};
+
+class WaveformLength : public ::testing::TestWithParam<LengthCase> {};
+
+TEST_P(WaveformLength, FollowsFramesSubframesAndSlots) {
+    const auto& c = GetParam();
+    NR5GWaveformSettings settings;
+    settings.SampleRateAuto->setValue(c.sampleRate);
+    settings.NumberOfFrames->setValue(c.frames);
+    settings.SubframeOffset->setValue(c.subframeOffset);
+    settings.NumberOfSubframes->setValue(c.subframes);
+    settings.SlotOffsetInSubframe->setValue(c.slotOffset);
+    settings.NumberOfSlotsInSubframe->setValue(c.slotCount);
+    auto carriers = settings.NRCarriers->getValue();
+    carriers->resize(1);
+    carriers->getItem(0)->Numerology->setValue(c.numerology);
+
+    const auto length = ComputeWaveformLength(settings);
+    EXPECT_EQ(length.totalSamples, c.expectedTotal);
+    EXPECT_EQ(length.startSample, c.expectedStart);
+}
+
+// Worked by hand. At 122.88 MHz and 30 kHz: fft 4096, cp 288, long cp 352, slot 61376 samples,
+// slots 0 and 1 (= slots / 2) are long (61440). At 30.72 MHz and 15 kHz: fft 2048, cp 144,
+// long cp 160, slot 30688; a cut counts every 15 kHz slot as 30688 + 2 x 16 = 30720, while the
+// offset before it counts slot 0 as a long slot only (30704).
+INSTANTIATE_TEST_SUITE_P(
+    Cases, WaveformLength,
+    ::testing::Values(LengthCase{"OneFrame", 122.88e6, 1, 0, 10, Numerology::SCS30k, -1, -1, 1228800, 0},
+                      LengthCase{"ThreeFrames", 30.72e6, 3, 0, 10, Numerology::SCS15k, -1, -1, 921600, 0},
+                      LengthCase{"SubframesWithOffset", 30.72e6, 1, 2, 3, Numerology::SCS15k, -1, -1, 92160, 61440},
+                      LengthCase{"CutSecondSlot30k", 122.88e6, 1, 0, 10, Numerology::SCS30k, 1, 1, 61440, 61440},
+                      LengthCase{"CutTwoSlots15k", 30.72e6, 1, 0, 10, Numerology::SCS15k, 1, 2, 61440, 30704},
+                      LengthCase{"CutAfterSubframeOffset60k", 122.88e6, 1, 1, 10, Numerology::SCS60kNCP, 1, 2,
+                                 // 60 kHz: fft 2048, cp 144, long cp 208; slot 30688, slots 0 and 2 long
+                                 30752 + 30688, 122880 + 30752},
+                      LengthCase{"CutExtendedPrefix", 122.88e6, 1, 0, 10, Numerology::SCS60kECP, 0, 1,
+                                 // extended prefix 512: 12 x (2048 + 512), long cp = cp
+                                 30720, 0}),
+    [](const auto& info) { return std::string(info.param.name); });
+
+TEST(WaveformLength, NoCutWithoutCarriers) {
+    NR5GWaveformSettings settings;
+    settings.SampleRateAuto->setValue(7.68e6);
+    settings.NumberOfSlotsInSubframe->setValue(1);
+    EXPECT_EQ(ComputeWaveformLength(settings).totalSamples, 76800);
+}
+
+TEST(WaveformLength, UnusableSampleRateIsReported) {
+    NR5GWaveformSettings settings;  // SampleRateAuto 0 by default
+    EXPECT_THROW(ComputeWaveformLength(settings), Orvalis_NR::EngineFailure);
+    settings.SampleRateAuto->setValue(1e9);
+    settings.NumberOfFrames->setValue(1000);  // far beyond an int of samples
+    EXPECT_THROW(ComputeWaveformLength(settings), Orvalis_NR::EngineFailure);
+}
+
+TEST(AntennaFileName, SplitsBeforeTheLastFourCharacters) {
+    using Orvalis_NR::AntennaFileName;
+    EXPECT_EQ(AntennaFileName("wave.bin", 0, 1), "wave.bin");
+    EXPECT_EQ(AntennaFileName("wave.bin", 0, 2), "wave0.bin");
+    EXPECT_EQ(AntennaFileName("wave.bin", 1, 2), "wave1.bin");
+    EXPECT_EQ(AntennaFileName("out/a.iq", 11, 12), "out/11a.iq");  // the split ignores the dot
+}
+
+}  // namespace
