@@ -3,7 +3,7 @@
 
 JOBS ?= 2
 CLI := build/release/apps/nrsynth/nrsynth
-DEMO_WAVE ?= examples/default.json
+DEMO_WAVE ?= examples/ssb_case_c_30khz.json
 
 deps:
 	@bash scripts/deps.sh

@@ -3,7 +3,7 @@
 set -euo pipefail
 
 packages=(
-  build-essential cmake ninja-build pkg-config
+  build-essential cmake ninja-build pkg-config ccache
   libfftw3-dev nlohmann-json3-dev libmsgsl-dev libcli11-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   python3 python3-numpy

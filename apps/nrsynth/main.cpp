@@ -4,6 +4,7 @@
 #include <iostream>
 
 #include "commands.h"
+#include "generate.h"
 #include "version.h"
 
 int main(int argc, char** argv) {
@@ -23,6 +24,16 @@ int main(int argc, char** argv) {
         "validate", "Report unknown keys and values of the wrong kind in WAVE.json");
     validate->add_option("wave", wave, "waveform document (JSON)")->required();
 
+    nrsynth_cli::GenerateOptions generateOptions;
+    auto* generate = app.add_subcommand(
+        "generate", "Generate WAVE.json through the C interface: one sample file (complex double) and one "
+                    "marker file (.mkr) per antenna");
+    generate->add_option("wave", generateOptions.wave, "waveform document (JSON)")->required();
+    generate->add_option("-o,--output", generateOptions.output,
+                         "sample file path; several antennas get their number before the extension")
+        ->capture_default_str();
+    generate->add_option("--export", generateOptions.exportFolder, "folder for the intermediate data export (reserved: this version writes no export yet)");
+
     CLI11_PARSE(app, argc, argv);
 
     if (*show) {
@@ -34,5 +45,6 @@ int main(int argc, char** argv) {
         return nrsynth_cli::showDocument(wave);
     }
     if (*validate) return nrsynth_cli::validateDocument(wave);
+    if (*generate) return nrsynth_cli::generateWaveform(generateOptions);
     return 0;
 }

@@ -112,7 +112,7 @@ class NR5GWaveformSettings : public ModelBase {
     std::shared_ptr<StringSetting> BusyState = std::make_shared<StringSetting>("BusyState");
     /// Host state: a waveform exists.
     std::shared_ptr<BoolSetting> Generated = std::make_shared<BoolSetting>("Generated");
-    /// Add the noise carrier (Part 4.6).
+    /// Add the noise carrier.
     std::shared_ptr<BoolSetting> AwgnEnabled = std::make_shared<BoolSetting>("AwgnEnabled");
     /// Carrier-to-noise ratio in dB.
     std::shared_ptr<DoubleSetting> CarrierToNoiseRatio =

@@ -51,5 +51,25 @@ check "show --defaults takes full type names" test $? -eq 0
 "$cli" show --defaults NoSuchType > /dev/null 2>&1; rc=$?
 check "show --defaults of an unknown type exits 1" test $rc -eq 1
 
+# generate: drives the library as a host does, prints the log and a summary per antenna
+cat > "$work/cw.json" <<'JSON'
+{"SampleRateAuto": 3840000, "NumberOfFrames": 2, "NumberOfAntennas": 2,
+ "NRCarriers": [{"CarrierType": "CW", "FrequencyOffset": 10000}]}
+JSON
+"$cli" generate "$work/cw.json" -o "$work/out/cw.bin" > "$work/gen.txt"; rc=$?
+check "generate exits 0" test $rc -eq 0
+check "generate prints the log" grep -q 'Run Engine OK!' "$work/gen.txt"
+check "generate lists antenna 1's file" grep -q 'cw1.bin' "$work/gen.txt"
+check "generate prints the length" grep -q 'length 76800 samples (20.000 ms)' "$work/gen.txt"
+check "generate writes 2 frames per antenna" test "$(stat -c %s "$work/out/cw0.bin")" -eq $((76800 * 16))
+check "generate writes the markers" test "$(stat -c %s "$work/out/cw1.bin.mkr")" -eq 76800
+check "a CW carrier has a PAPR of 0 dB" grep -q 'PAPR 0.00 dB' "$work/gen.txt"
+"$cli" generate "$work/cw.json" -o x > "$work/gen.txt" 2>&1; rc=$?
+check "generate with a bad output path exits 1" test $rc -eq 1
+check "generate reports the engine's failure" grep -q 'Init Engine Error!' "$work/gen.txt"
+"$cli" generate "$work/bad.json" > "$work/gen.txt" 2>&1; rc=$?
+check "generate of a bad document exits 1" test $rc -eq 1
+check "generate reports the reader's failure" grep -q 'expected an integer' "$work/gen.txt"
+
 echo "cli: $failures failed"
 exit $((failures > 0))

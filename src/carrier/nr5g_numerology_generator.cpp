@@ -1,0 +1,360 @@
+#include "carrier/nr5g_numerology_generator.h"
+
+#include <algorithm>
+#include <cmath>
+#include <string>
+
+#include "downlink/pbch_generator.h"
+#include "dsp/sinc_low_pass.h"
+#include "engine/engine_failure.h"
+#include "engine/log.h"
+
+namespace Orvalis_NR {
+
+using Models::Nr5g::CarrierType;
+using Models::Nr5g::PhaseCompensationMode;
+using Models::Nr5g::WindowingMethod;
+
+namespace {
+
+struct NumerologyGeometry {
+    int mu;
+    bool extendedCp;
+    int symbolsPerSlot;
+};
+
+// Numerology (position of the enumeration) to mu, prefix and symbols per slot.
+constexpr NumerologyGeometry kGeometry[6] = {{0, false, 14}, {1, false, 14}, {2, false, 14},
+                                             {2, true, 12},  {3, false, 14}, {4, false, 14}};
+
+bool isRealTime(PhaseCompensationMode mode) {
+    return mode == PhaseCompensationMode::AutoRT || mode == PhaseCompensationMode::ManualRT;
+}
+
+}  // namespace
+
+NR5GNumerologyGenerator::~NR5GNumerologyGenerator() {
+    for (auto* generator : pbchGenerators) delete generator;
+}
+
+void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform, Models::Nr5g::NRCarrier& owner,
+                                   int index) {
+    Log("Start Init MuGen");
+    if (index < 0 || index > 5) failWith("Numerology index out of range.", std::to_string(index));
+    settings = &waveform;
+    carrier = &owner;
+    numerology = index;
+    numberOfAntennas = waveform.NumberOfAntennas->getValue();
+    cellId = owner.CellID->getValue();
+    sampleDelay = 0;
+    isPrimary = false;
+    hasValidChannel = false;
+
+    // Relate the sample rate to the base rate of 30.72 MHz.
+    sampleRate = waveform.SampleRateAuto->getValue();
+    const double ratio = sampleRate > 3.072e7 ? sampleRate / 3.072e7 : 3.072e7 / sampleRate;
+    if (!(sampleRate > 0.0) || !(ratio < 2048.0))
+        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(sampleRate));
+    const int up = sampleRate > 3.072e7 ? static_cast<int>(ratio) : 1;
+    const int down = sampleRate > 3.072e7 ? 1 : static_cast<int>(ratio);
+
+    const auto& geometry = kGeometry[index];
+    mu = geometry.mu;
+    extendedCp = geometry.extendedCp;
+    symbolsPerSlot = geometry.symbolsPerSlot;
+    slotsPerSubframe = 1 << mu;
+    symbolsPerFrame = symbolsPerSlot * slotsPerSubframe * 10;
+    fftSize = (2048 / down * up) / (1 << mu);
+
+    const double pointA = owner.FrequencyOffsetOfPointA->getValue();
+    if (!(std::abs(pointA) <= 1.0e10))
+        failWith("FrequencyOffsetOfPointA out of range.", "FrequencyOffsetOfPointA " + std::to_string(pointA));
+    const double windowBeta = owner.WindowBeta->getValue();
+    if (!(windowBeta >= 0.0 && windowBeta <= 1.0))
+        failWith("WindowBeta out of range.", "WindowBeta " + std::to_string(windowBeta));
+
+    for (auto* generator : pbchGenerators) delete generator;
+    pbchGenerators.clear();
+    lowestSubcarrier = 360000;
+    highestSubcarrier = 0;
+    transformPrecoded = false;
+    if (owner.CarrierType->getValue() == CarrierType::DL) buildDownlinkChannels();
+    if (!hasValidChannel) return;
+    if (fftSize < 1) failWith("SampleRateAuto is too low for this numerology.", "SampleRateAuto " + std::to_string(sampleRate));
+
+    // The first symbol of each half subframe carries the longer prefix.
+    cpLengths.assign(static_cast<std::size_t>(symbolsPerSlot * slotsPerSubframe / 2), extendedCp ? fftSize / 4 : fftSize * 9 / 128);
+    if (!extendedCp) cpLengths[0] = 16 / down * up + fftSize * 9 / 128;
+
+    const auto phaseMode = waveform.PhaseCompensation->getValue();
+    modulator.windowLength = isRealTime(phaseMode) ? 0 : static_cast<int>(std::lround(fftSize * windowBeta));
+    modulator.centred = owner.WindowingMethod->getValue() == WindowingMethod::CenteredAtSymbolBoundary ? 1 : 0;
+    modulator.oversampling = 1;
+    modulator.Init(fftSize, cpLengths, symbolsPerFrame, owner.DCPunctured->getValue(), numberOfAntennas);
+    const auto rows = static_cast<std::size_t>(numberOfAntennas);
+    const auto elements = static_cast<std::size_t>(symbolsPerFrame) * static_cast<std::size_t>(fftSize);
+    grid.assign(rows, std::vector<std::complex<double>>(elements));
+    occupancy.assign(rows, std::vector<int>(elements));
+    symbolMarks.assign(rows, std::vector<int>(static_cast<std::size_t>(symbolsPerFrame)));
+    Log("End Init OFDM");
+
+    filters.clear();
+    if (owner.BasebandFilter->getValue() && !isRealTime(phaseMode)) designFilter();
+}
+
+void NR5GNumerologyGenerator::buildDownlinkChannels() {
+    auto downlink = carrier->Downlink->getValue();
+    auto ssb = downlink->SSPBCH->getValue();
+    Log("Start Init PBCH");
+    if (ssb->Enabled->getValue()) {
+        auto* generator = new PBCH_Generator();
+        pbchGenerators.push_back(generator);
+        generator->Init(ssb.get(), carrier, fftSize);
+        // Blocks of another numerology only keep their footprint clear here.
+        generator->ReserveOnly = static_cast<int>(ssb->Numerology->getValue()) != numerology;
+        if (!generator->ReserveOnly) {
+            hasValidChannel = true;
+            // Counted from point A; the filter design adds point A back.
+            const int first = generator->BlockStart - generator->PointAOffset;
+            lowestSubcarrier = std::min(first, lowestSubcarrier);
+            highestSubcarrier = std::max(first + generator->BlockWidth - 1, 0);
+        }
+    }
+}
+
+int NR5GNumerologyGenerator::filterGuard() const {
+    std::string name;
+    if (carrier->CarrierType->getValue() == CarrierType::UL) {
+        auto bwps = carrier->Uplink->getValue()->BWP->getValue();
+        if (bwps->getCount() >= 1) name = bwps->getItem(0)->Name->getValue();
+    } else if (carrier->CarrierType->getValue() == CarrierType::DL) {
+        auto bwps = carrier->Downlink->getValue()->BWP->getValue();
+        if (bwps->getCount() >= 2) name = bwps->getItem(1)->Name->getValue();
+    }
+    const auto at = name.find("FB");
+    if (at != std::string::npos) {
+        const std::string digit = name.substr(at + 2, 1);
+        if (digit.empty() || digit[0] < '0' || digit[0] > '9')
+            throw std::invalid_argument("bandwidth part Name \"" + name + "\": no guard digit after \"FB\"");
+        return digit[0] - '0';
+    }
+    return fftSize > 8192 ? fftSize / 8192 : 1;
+}
+
+void NR5GNumerologyGenerator::designFilter() {
+    int taps = 1025;
+    const int n = static_cast<int>(sampleRate / (15000.0 * (1 << mu)));
+    const int cp = numerology == 3 ? n * 512 / 2048 : n * 144 / 2048;
+    if (transformPrecoded) taps = std::min(cp, 1025);
+    if (taps < 1) failWith("The baseband filter would have no taps.", "SampleRateAuto " + std::to_string(sampleRate));
+
+    const int guard = filterGuard();
+    const double x = static_cast<double>(highestSubcarrier - lowestSubcarrier + 1) / fftSize + guard * 24.0 / fftSize;
+    const auto prototype = Generate_SincLowPass(x, taps, 1, true);
+
+    // Shift the low-pass to the middle of the occupied span.
+    const int pointA = static_cast<int>(carrier->FrequencyOffsetOfPointA->getValue() / 15000.0 / (1 << mu));
+    const int centre = lowestSubcarrier + 2 * pointA + highestSubcarrier;
+    const double step = centre * 0.5 * 2.0 * 3.141592653589793 / fftSize;
+    const double gain = std::sqrt(x);
+    std::vector<std::complex<double>> coefficients(static_cast<std::size_t>(taps));
+    for (int i = 0; i < taps; ++i) {
+        const double phase = (i - taps * 0.5) * step;
+        const double h = prototype[static_cast<std::size_t>(i)] * gain;
+        coefficients[static_cast<std::size_t>(i)] = {std::cos(phase) * h, std::sin(phase) * h};
+    }
+    for (int a = 0; a < numberOfAntennas; ++a) filters.push_back(FilterCreator::create(coefficients, 7000));
+}
+
+std::vector<int> NR5GNumerologyGenerator::countChannels() const {
+    std::vector<int> counts(8, 0);
+    for (const auto* generator : pbchGenerators)
+        if (!generator->ReserveOnly) ++counts[static_cast<std::size_t>(channelOrder[PlacePBCH])];
+    return counts;
+}
+
+void NR5GNumerologyGenerator::MarkUnavailable() {
+    if (carrier->CarrierType->getValue() != CarrierType::DL || numerology != 0) return;
+    auto coexistence = carrier->Downlink->getValue()->LTECoexistence->getValue();
+    if (!coexistence->Enabled->getValue()) return;
+    static constexpr int kRbCount[6] = {6, 15, 25, 50, 75, 100};
+    const int pointA = static_cast<int>(carrier->FrequencyOffsetOfPointA->getValue() / 15000.0);
+    auto crsList = coexistence->LTECRS->getValue();
+    for (int c = 0; c < crsList->getCount(); ++c) {
+        auto crs = crsList->getItem(c);
+        const int bandwidth = static_cast<int>(crs->LTEBandwidth->getValue());
+        const int rbCount = bandwidth >= 0 && bandwidth < 6 ? kRbCount[bandwidth] : 0;
+        const int halfWidth = rbCount * 6;
+        const int offset = crs->OffsetToPointA->getValue();
+        const int ports = crs->NumberOfCRSAntennaPorts->getValue();
+        const int vShift = crs->VShift->getValue();
+        bool mbsfn[10] = {};
+        const std::string list = crs->MBSFNSubframeIndexArrayStr->getValue();
+        for (std::size_t start = 0; start < list.size();) {
+            const auto comma = std::min(list.find(',', start), list.size());
+            int subframe = 0;
+            try {
+                subframe = std::stoi(list.substr(start, comma - start));
+            } catch (const std::logic_error&) {
+                throw std::invalid_argument("LTECRS[" + std::to_string(c) + "].MBSFNSubframeIndexArrayStr \"" + list +
+                                            "\": not a comma list of subframe numbers");
+            }
+            if (subframe >= 0 && subframe < 10) mbsfn[subframe] = true;
+            start = comma + 1;
+        }
+        auto usesSymbol = [ports](int l) {
+            if (ports == 1 || ports == 2) return l == 0 || l == 4 || l == 7 || l == 11;
+            if (ports == 4) return l == 0 || l == 1 || l == 4 || l == 7 || l == 8 || l == 11;
+            return true;
+        };
+        for (int sf = 0; sf < 10; ++sf) {
+            const int symbolCount = mbsfn[sf] ? 2 : 14;
+            for (int l = 0; l < symbolCount; ++l) {
+                if (!usesSymbol(l)) continue;
+                for (int r = 0; r < rbCount; ++r) {
+                    const int base = offset - halfWidth + 12 * r;
+                    int first = 0;
+                    int spacing = 3;
+                    if (ports == 1) {
+                        first = (l == 0 || l == 7) ? vShift : (l == 4 || l == 11) ? (vShift + 3) % 6 : 0;
+                        spacing = 6;
+                    } else {
+                        first = vShift % 3;
+                    }
+                    for (int p = first; p < 12; p += spacing) {
+                        if (p < 0 || static_cast<unsigned>(base + p) >= 3300u) continue;
+                        int k = base + p + pointA + (12 * r + p >= halfWidth ? 1 : 0);
+                        if (k >= fftSize / 2) continue;
+                        if (k < 0) k += fftSize;
+                        if (k < 0) continue;
+                        const auto at = static_cast<std::size_t>(14 * sf + l) * static_cast<std::size_t>(fftSize) +
+                                        static_cast<std::size_t>(k);
+                        for (auto& row : occupancy)
+                            if (at < row.size()) row[at] = 1600;
+                    }
+                }
+            }
+        }
+    }
+}
+
+void NR5GNumerologyGenerator::ResetDataSource() {
+    for (auto* generator : pbchGenerators) if (generator->Source) generator->Source->Reset();
+}
+
+bool NR5GNumerologyGenerator::takeCancel() { return cancelRequested.exchange(0, std::memory_order_relaxed) != 0; }
+
+void NR5GNumerologyGenerator::blankOutsideWaveform() {
+    const int subframes = settings->NumberOfSubframes->getValue();
+    if (subframes >= 10) return;
+    const int offset = settings->SubframeOffset->getValue();
+    const int slotOffset = settings->SlotOffsetInSubframe->getValue();
+    const int slotCount = settings->NumberOfSlotsInSubframe->getValue();
+    for (auto& row : grid) {
+        const std::size_t subframeSize = row.size() / 10;
+        const std::size_t slotSize = subframeSize / static_cast<std::size_t>(slotsPerSubframe);
+        for (int sf = 0; sf < 10; ++sf) {
+            auto* subframe = row.data() + subframeSize * static_cast<std::size_t>(sf);
+            if (sf < offset || sf >= offset + subframes) {
+                std::fill(subframe, subframe + subframeSize, std::complex<double>{});
+            } else if (subframes == 1 && slotOffset != -1) {
+                for (int slot = 0; slot < slotsPerSubframe; ++slot)
+                    if (slot < slotOffset || slot >= slotOffset + slotCount)
+                        std::fill(subframe + slotSize * static_cast<std::size_t>(slot),
+                                  subframe + slotSize * static_cast<std::size_t>(slot + 1), std::complex<double>{});
+            }
+        }
+    }
+}
+
+void NR5GNumerologyGenerator::deriveMarkers(const std::vector<std::vector<int>>& marks,
+                                            std::vector<std::vector<int>>& sampleMarkers, int markerExtension) {
+    const int cpCount = static_cast<int>(cpLengths.size());
+    for (int a = 0; a < numberOfAntennas && a < static_cast<int>(sampleMarkers.size()); ++a) {
+        auto& words = sampleMarkers[static_cast<std::size_t>(a)];
+        const auto& flags = marks[static_cast<std::size_t>(a)];
+        if (words.empty()) continue;
+        const std::size_t length = words.size();
+        std::size_t pos = 0;
+        for (int s = 0; s < symbolsPerFrame; ++s) {
+            const int symbolLength = cpLengths[static_cast<std::size_t>(s % cpCount)] + fftSize;
+            const int flag = flags[static_cast<std::size_t>(s)];
+            const bool previous = flags[static_cast<std::size_t>((s + symbolsPerFrame - 1) % symbolsPerFrame)] & 1;
+            const bool next = flags[static_cast<std::size_t>((s + 1) % symbolsPerFrame)] & 1;
+            for (int i = 0; i < symbolLength; ++i, ++pos) {
+                int& word = words[pos % length];
+                if (flag == 3) word |= 12;  // RF ALC and RF blanking
+                if (flag == 1 || (previous && i <= markerExtension)) word |= 8;
+                if (next && symbolLength - 1 - i <= markerExtension) word |= 8;
+            }
+            if (cancelRequested.load(std::memory_order_relaxed)) return;
+        }
+    }
+}
+
+void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::complex<double>>>& output,
+                                 std::vector<std::vector<int>>& sampleMarkers) {
+    if (!hasValidChannel) return;
+    for (auto& row : symbolMarks) std::fill(row.begin(), row.end(), 0);
+    if (takeCancel()) return;
+    for (auto& row : grid) std::fill(row.begin(), row.end(), std::complex<double>{});
+    for (auto& row : occupancy) std::fill(row.begin(), row.end(), 0);
+    MarkUnavailable();
+    if (takeCancel()) return;
+
+    // The channels in their order of precedence: what is mapped first owns its elements.
+    bool anyMapped = false;
+    Log("Start Generate PBCH");
+    for (auto* generator : pbchGenerators) {
+        const bool markAlc = isPrimary && !generator->ReserveOnly;  // no PDSCH generator exists here
+        generator->Generate(frame);
+        generator->Map(grid, occupancy, symbolMarks, markAlc, mu, extendedCp);
+        if (!generator->ReserveOnly) anyMapped = true;
+        if (takeCancel()) return;
+    }
+    if (!pbchGenerators.empty()) Log("End Generate PBCH");
+    if (takeCancel()) return;
+    if (!anyMapped) return;
+
+    Log("Start OFDM");
+    const auto phaseMode = settings->PhaseCompensation->getValue();
+    double phaseStep = 0.0;
+    if (phaseMode == PhaseCompensationMode::Auto || phaseMode == PhaseCompensationMode::Manual)
+        phaseStep = (carrier->FrequencyOffset->getValue() + settings->RadioFrequency->getValue()) * 6.283185307179586 /
+                    sampleRate;
+    blankOutsideWaveform();
+    if (takeCancel()) return;
+    modulator.Go(grid, output, phaseStep, frame);
+    Log("End OFDM");
+    if (takeCancel()) return;
+
+    // 30 kHz is the reference level when several numerologies, carriers or noise are summed.
+    const bool scale = carrier->NumerologyMode->getValue() == Models::Nr5g::NumerologyMode::MultipleNumerologies ||
+                       settings->NRCarriers->getValue()->getCount() >= 2 || settings->AwgnEnabled->getValue();
+    if (scale && mu != 1) {
+        const double factor = 1.0 / std::sqrt((1 << mu) * 0.5);
+        for (auto& row : output)
+            for (auto& sample : row) sample *= factor;
+    }
+    if (frame == 0 && testVectorEnabled) cpAddedFrame = output;
+
+    if (!filters.empty() && static_cast<int>(filters.size()) == numberOfAntennas) {
+        for (int a = 0; a < numberOfAntennas; ++a) {
+            auto& row = output[static_cast<std::size_t>(a)];
+            if (!row.empty())
+                filters[static_cast<std::size_t>(a)]->filter(row.data(), static_cast<int>(row.size()), row.data(),
+                                                             static_cast<int>(row.size()));
+            if (takeCancel()) return;
+        }
+    }
+
+    const int filterDelay = filters.empty() ? 0 : (static_cast<int>(filters[0]->getDelayLine().size()) - 1) >> 1;
+    const int windowSpan =
+        isRealTime(phaseMode) ? 0 : static_cast<int>(fftSize * carrier->WindowBeta->getValue());
+    const bool centred = carrier->WindowingMethod->getValue() == WindowingMethod::CenteredAtSymbolBoundary;
+    sampleDelay = centred ? filterDelay + windowSpan / 2 : filterDelay;
+    deriveMarkers(symbolMarks, sampleMarkers, filterDelay + windowSpan / 2);
+    takeCancel();
+}
+
+}  // namespace Orvalis_NR

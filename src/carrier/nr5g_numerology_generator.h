@@ -1,0 +1,89 @@
+#pragma once
+// One numerology of a carrier: its frame geometry, its channel generators, its frame store,
+// OFDM modulator and baseband filter. A numerology without a channel stays idle. Go turns one
+// radio frame of it into samples at the waveform's rate.
+
+#include <atomic>
+#include <complex>
+#include <memory>
+#include <vector>
+
+#include "dsp/filter.h"
+#include "dsp/ofdm_modulator.h"
+#include "dsp/slot_grid.h"
+#include "models/nr5g_waveform_settings.h"
+
+namespace Orvalis_NR {
+
+class PBCH_Generator;
+
+/// Places of the channel kinds in a count vector.
+enum ChannelPlace { PlacePBCH, PlacePDSCH, PlacePDCCH, PlaceCSIRS, PlacePUSCH, PlacePUCCH, PlaceSRS, PlacePRS };
+
+class NR5GNumerologyGenerator {
+public:
+    NR5GNumerologyGenerator() = default;
+    ~NR5GNumerologyGenerator();
+    NR5GNumerologyGenerator(const NR5GNumerologyGenerator&) = delete;
+    NR5GNumerologyGenerator& operator=(const NR5GNumerologyGenerator&) = delete;
+    NR5GNumerologyGenerator(NR5GNumerologyGenerator&&) = delete;
+    NR5GNumerologyGenerator& operator=(NR5GNumerologyGenerator&&) = delete;
+
+    /// Geometry of numerology `numerology` (0..5, the position of Numerology) at the waveform's
+    /// sample rate, and the channels of the carrier that use it.
+    void Init(Models::Nr5g::NR5GWaveformSettings& settings, Models::Nr5g::NRCarrier& carrier, int numerology);
+    /// One frame of this numerology into `output` (per antenna, one frame at the waveform rate,
+    /// cleared by the caller) and its marker words ORed into `sampleMarkers`.
+    void Go(int frame, int numberOfFrames, std::vector<std::vector<std::complex<double>>>& output,
+            std::vector<std::vector<int>>& sampleMarkers);
+    /// Reserves the LTE cell reference signals of spectrum sharing in `occupancy`.
+    void MarkUnavailable();
+    /// Rewinds the payload sources of all channels.
+    void ResetDataSource();
+    /// Number of channel generators per place of `channelOrder`; a placeholder PBCH does not count.
+    std::vector<int> countChannels() const;
+
+    bool isPrimary = false;
+    int numberOfAntennas = 0;
+    bool hasValidChannel = false;
+    Models::Nr5g::NRCarrier* carrier = nullptr;
+    Models::Nr5g::NR5GWaveformSettings* settings = nullptr;
+    OfdmModulator modulator;
+    SlotGrid grid;
+    OccupancyGrid occupancy;
+    int numerology = 0;
+    int cellId = 0;
+    int fftSize = 0;
+    std::vector<int> cpLengths;
+    int symbolsPerFrame = 0;
+    int symbolsPerSlot = 0;
+    int slotsPerSubframe = 0;
+    int reservedGeometry = 0;
+    bool extendedCp = false;
+    int mu = 0;
+    double sampleRate = 0.0;
+    std::vector<int> channelCounts;
+    int channelOrder[8] = {0, 1, 2, 3, 4, 5, 6, 7};
+    std::vector<PBCH_Generator*> pbchGenerators;
+    std::vector<std::shared_ptr<Filter>> filters;
+    int sampleDelay = 0;
+    std::atomic<char> cancelRequested{0};
+    std::vector<std::vector<std::complex<double>>> cpAddedFrame;
+    char testVectorEnabled = 0;
+
+private:
+    void buildDownlinkChannels();
+    void designFilter();
+    int filterGuard() const;
+    bool takeCancel();
+    void blankOutsideWaveform();
+    void deriveMarkers(const std::vector<std::vector<int>>& symbolMarks, std::vector<std::vector<int>>& sampleMarkers,
+                       int markerExtension);
+
+    int lowestSubcarrier = 360000;
+    int highestSubcarrier = 0;
+    bool transformPrecoded = false;
+    std::vector<std::vector<int>> symbolMarks;  // per antenna, one word per symbol of the frame
+};
+
+}  // namespace Orvalis_NR

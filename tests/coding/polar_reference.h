@@ -1,0 +1,198 @@
+#pragma once
+// Plain reference forms of the polar chain of TS 38.212 (clauses 5.3.1, 5.4.1), written
+// straight from the clause text and reading the tables from the project's JSON data, not from
+// the generated header. The tests compare the library against these.
+
+#include <algorithm>
+#include <bit>
+#include <cmath>
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <random>
+#include <set>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "test_support.h"
+
+namespace polar_ref {
+
+using Bits = std::vector<char>;
+
+/// Column 1 of the rows of a table in data/3gpp/ (rows [index, value]).
+inline std::vector<int> tableColumn(const std::string& file) {
+    std::ifstream in(nrsynth_test::sourceDir() / "data" / "3gpp" / file);
+    if (!in) throw std::runtime_error("cannot open " + file);
+    const auto doc = nlohmann::json::parse(in);
+    std::vector<int> values;
+    for (const auto& row : doc.at("rows")) values.push_back(row.at(1).get<int>());
+    return values;
+}
+
+inline const std::vector<int>& interleavingPattern() {
+    static const auto t = tableColumn("ts38212_table_5_3_1_1_1_polar_interleaving_pattern.json");
+    return t;
+}
+inline const std::vector<int>& polarSequence() {  // Q by ascending W
+    static const auto t = tableColumn("ts38212_table_5_3_1_2_1_polar_sequence.json");
+    return t;
+}
+inline const std::vector<int>& subBlockPattern() {
+    static const auto t = tableColumn("ts38212_table_5_4_1_1_1_subblock_interleaver_pattern.json");
+    return t;
+}
+
+/// N of clause 5.3.1 with logarithms in double, as the clause writes it.
+inline int codeLength(int K, int E, int nMax) {
+    const double logE = std::ceil(std::log2(static_cast<double>(E)));
+    double n1 = logE;
+    if (E <= (9.0 / 8.0) * std::pow(2.0, logE - 1) && static_cast<double>(K) / E < 9.0 / 16.0)
+        n1 = logE - 1;
+    const double n2 = std::ceil(std::log2(K / (1.0 / 8.0)));
+    const double n = std::max(std::min({n1, n2, static_cast<double>(nMax)}), 5.0);
+    return static_cast<int>(std::pow(2.0, n));
+}
+
+/// J(n) of clause 5.4.1.1.
+inline int subBlockJ(int n, int N) {
+    const int i = 32 * n / N;
+    return subBlockPattern()[static_cast<std::size_t>(i)] * (N / 32) + n % (N / 32);
+}
+
+enum class Selection { Repetition, Puncturing, Shortening };
+
+inline Selection selection(int K, int E, int N) {
+    if (E >= N) return Selection::Repetition;
+    return static_cast<double>(K) / E <= 7.0 / 16.0 ? Selection::Puncturing : Selection::Shortening;
+}
+
+struct Sets {
+    int N = 0;
+    std::vector<int> info;  // Q_I, ascending reliability
+    std::set<int> frozen;   // Q_F without the rate-matching pre-frozen positions
+    std::set<int> preFrozen;
+    std::set<int> parity;  // Q_PC
+};
+
+/// Clause 5.3.1.2 with the Q_F,tmp of clause 5.4.1.1.
+inline Sets sets(int K, int E, int nMax, int nPC, int nPCwm) {
+    Sets s;
+    const int N = s.N = codeLength(K, E, nMax);
+    std::vector<int> Q;
+    for (int q : polarSequence())
+        if (q < N) Q.push_back(q);
+
+    if (E < N) {
+        if (selection(K, E, N) == Selection::Puncturing) {
+            for (int n = 0; n <= N - E - 1; ++n) s.preFrozen.insert(subBlockJ(n, N));
+            const int limit = E >= 3 * N / 4 ? static_cast<int>(std::ceil(3.0 * N / 4 - E / 2.0))
+                                             : static_cast<int>(std::ceil(9.0 * N / 16 - E / 4.0));
+            for (int n = 0; n <= limit - 1; ++n) s.preFrozen.insert(n);
+        } else {
+            for (int n = E; n <= N - 1; ++n) s.preFrozen.insert(subBlockJ(n, N));
+        }
+    }
+    std::vector<int> remaining;
+    for (int q : Q)
+        if (!s.preFrozen.count(q)) remaining.push_back(q);
+    const int count = K + nPC;
+    if (count > static_cast<int>(remaining.size())) throw std::invalid_argument("too many bits");
+    s.info.assign(remaining.end() - count, remaining.end());
+    s.frozen.insert(remaining.begin(), remaining.end() - count);
+
+    // Q_PC: the nPC - nPCwm least reliable of Q_I, and nPCwm of minimum row weight
+    // 2^popcount(i) among the K most reliable, the most reliable first at equal weight.
+    for (int i = 0; i < nPC - nPCwm; ++i) s.parity.insert(s.info[static_cast<std::size_t>(i)]);
+    std::vector<int> tilde(s.info.begin() + nPC, s.info.end());
+    std::reverse(tilde.begin(), tilde.end());  // most reliable first
+    std::stable_sort(tilde.begin(), tilde.end(), [](int a, int b) {
+        return std::popcount(static_cast<unsigned>(a)) < std::popcount(static_cast<unsigned>(b));
+    });
+    for (int i = 0; i < nPCwm; ++i) s.parity.insert(tilde[static_cast<std::size_t>(i)]);
+    return s;
+}
+
+/// u of clause 5.3.1.2 (with the interleaver of 5.3.1.1 when iIL is 1).
+inline Bits encoderInput(const Bits& c, int E, int nMax, int iIL, int nPC, int nPCwm) {
+    const int K = static_cast<int>(c.size());
+    const Sets s = sets(K, E, nMax, nPC, nPCwm);
+    Bits cPrime(c);
+    if (iIL == 1) {
+        int k = 0;
+        for (int m = 0; m <= 163; ++m) {
+            const int pi = interleavingPattern()[static_cast<std::size_t>(m)];
+            if (pi >= 164 - K) cPrime[static_cast<std::size_t>(k++)] = c[pi - (164 - K)];
+        }
+    }
+    const std::set<int> info(s.info.begin(), s.info.end());
+    Bits u(static_cast<std::size_t>(s.N), 0);
+    int k = 0;
+    char y0 = 0, y1 = 0, y2 = 0, y3 = 0, y4 = 0;
+    for (int n = 0; n < s.N; ++n) {
+        const char yCyc = y0;
+        y0 = y1, y1 = y2, y2 = y3, y3 = y4, y4 = yCyc;
+        if (!info.count(n)) continue;
+        if (s.parity.count(n)) {
+            u[n] = y0;
+        } else {
+            u[n] = cPrime[k++];
+            y0 = static_cast<char>(y0 ^ u[n]);
+        }
+    }
+    return u;
+}
+
+/// d = u G_N by the recursive butterfly: G_2m = [G_m 0; G_m G_m], so the first half of the
+/// output is (u_a + u_b) G_m and the second half u_b G_m.
+inline Bits butterfly(const Bits& u) {
+    if (u.size() == 1) return u;
+    const std::size_t m = u.size() / 2;
+    Bits sum(m), upper(u.begin() + m, u.end());
+    for (std::size_t i = 0; i < m; ++i) sum[i] = static_cast<char>(u[i] ^ u[i + m]);
+    Bits d = butterfly(sum);
+    const Bits b = butterfly(upper);
+    d.insert(d.end(), b.begin(), b.end());
+    return d;
+}
+
+/// Clause 5.4.1: sub-block interleaver, bit selection and (iBIL 1) coded-bit interleaver.
+inline Bits rateMatch(const Bits& d, int K, int E, int iBIL) {
+    const int N = static_cast<int>(d.size());
+    Bits y(d.size());
+    for (int n = 0; n < N; ++n) y[n] = d[subBlockJ(n, N)];
+    Bits e(static_cast<std::size_t>(E));
+    switch (selection(K, E, N)) {
+        case Selection::Repetition:
+            for (int k = 0; k < E; ++k) e[k] = y[k % N];
+            break;
+        case Selection::Puncturing:
+            for (int k = 0; k < E; ++k) e[k] = y[k + N - E];
+            break;
+        case Selection::Shortening:
+            for (int k = 0; k < E; ++k) e[k] = y[k];
+            break;
+    }
+    if (iBIL != 1) return e;
+    int T = 0;
+    while (T * (T + 1) / 2 < E) ++T;
+    constexpr char kNull = 9;
+    std::vector<Bits> v(static_cast<std::size_t>(T), Bits(static_cast<std::size_t>(T), kNull));
+    int k = 0;
+    for (int i = 0; i < T; ++i)
+        for (int j = 0; j < T - i; ++j, ++k)
+            if (k < E) v[i][j] = e[k];
+    Bits f;
+    for (int j = 0; j < T; ++j)
+        for (int i = 0; i < T - j; ++i)
+            if (v[i][j] != kNull) f.push_back(v[i][j]);
+    return f;
+}
+
+inline Bits randomBits(std::size_t n, std::mt19937& rng) {
+    Bits bits(n);
+    for (auto& b : bits) b = static_cast<char>(rng() & 1);
+    return bits;
+}
+
+}  // namespace polar_ref
