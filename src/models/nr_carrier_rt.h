@@ -82,11 +82,11 @@ class NRCarrierRT : public ModelBase {
     std::shared_ptr<Int32Setting> NumberOfRB = std::make_shared<Int32Setting>("NumberOfRB");
     /// Subcarrier offset k0.
     std::shared_ptr<DoubleSetting> k0 = std::make_shared<DoubleSetting>("k0");
-    /// Intra-cell guard bands for numerology 0, as text; used by the interlaced allocation
+    /// Intra-cell guard bands for numerology 0, as text; the interlaced allocation
     /// reads it.
     std::shared_ptr<StringSetting> IntraCellGuardBandMu0 =
         std::make_shared<StringSetting>("IntraCellGuardBandMu0");
-    /// Intra-cell guard bands for numerology 1, as text; used by the interlaced allocation
+    /// Intra-cell guard bands for numerology 1, as text; the interlaced allocation
     /// reads it.
     std::shared_ptr<StringSetting> IntraCellGuardBandMu1 =
         std::make_shared<StringSetting>("IntraCellGuardBandMu1");
