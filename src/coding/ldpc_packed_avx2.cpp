@@ -10,27 +10,35 @@ namespace Orvalis_NR::ldpc_detail {
 namespace {
 
 struct Avx2Ops {
+    // Packs 32 ints at a time: saturating packs narrow them to bytes (0, 1 and -2 stay
+    // themselves, every other value becomes a byte outside that set), one permute restores
+    // the order the 128-bit lanes of the packs mixed up, and the low bits go to a movemask.
     static PackScan pack(const int* in, int n, std::uint64_t* bits) {
-        const __m256i notOne = _mm256_set1_epi32(~1);
-        const __m256i fillerValue = _mm256_set1_epi32(-2);
+        const __m256i notOne = _mm256_set1_epi8(~1);
+        const __m256i fillerValue = _mm256_set1_epi8(-2);
         const __m256i zero = _mm256_setzero_si256();
-        __m256i valid = _mm256_set1_epi32(-1);
+        const __m256i laneOrder = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
+        __m256i valid = _mm256_set1_epi8(-1);
         __m256i filler = zero;
+        const auto load = [in](int i) {
+            return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
+        };
+        // Low bits of in[i..i+31] as a 32-bit mask; validity and fillers folded in.
+        const auto pack32 = [&](int i) {
+            const __m256i shorts01 = _mm256_packs_epi32(load(i), load(i + 8));
+            const __m256i shorts23 = _mm256_packs_epi32(load(i + 16), load(i + 24));
+            const __m256i b =
+                _mm256_permutevar8x32_epi32(_mm256_packs_epi16(shorts01, shorts23), laneOrder);
+            const __m256i isFiller = _mm256_cmpeq_epi8(b, fillerValue);
+            const __m256i isBit = _mm256_cmpeq_epi8(_mm256_and_si256(b, notOne), zero);
+            valid = _mm256_and_si256(valid, _mm256_or_si256(isBit, isFiller));
+            filler = _mm256_or_si256(filler, isFiller);
+            return static_cast<std::uint32_t>(_mm256_movemask_epi8(_mm256_slli_epi16(b, 7)));
+        };
         const int full = n / 64;
         for (int w = 0; w < full; ++w) {
-            std::uint64_t word = 0;
-            for (int g = 0; g < 8; ++g) {
-                const __m256i v =
-                    _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + 64 * w + 8 * g));
-                const auto mask = static_cast<unsigned>(
-                    _mm256_movemask_ps(_mm256_castsi256_ps(_mm256_slli_epi32(v, 31))));
-                word |= static_cast<std::uint64_t>(mask) << (8 * g);
-                const __m256i isFiller = _mm256_cmpeq_epi32(v, fillerValue);
-                const __m256i isBit = _mm256_cmpeq_epi32(_mm256_and_si256(v, notOne), zero);
-                valid = _mm256_and_si256(valid, _mm256_or_si256(isBit, isFiller));
-                filler = _mm256_or_si256(filler, isFiller);
-            }
-            bits[w] = word;
+            const std::uint64_t low = pack32(64 * w);
+            bits[w] = low | (std::uint64_t{pack32(64 * w + 32)} << 32);
         }
         bool bad = _mm256_movemask_epi8(valid) != -1;
         bool anyFiller = _mm256_movemask_epi8(filler) != 0;
@@ -87,16 +95,25 @@ struct Avx2Ops {
         }
     }
 
+    // One 32-bit load feeds four stores of eight ints: each lane shifts its own bit down.
     static void unpack(const std::uint64_t* v, int z, int* out) {
         const auto* bytes = reinterpret_cast<const unsigned char*>(v);
-        const __m256i lanes = _mm256_setr_epi32(1, 2, 4, 8, 16, 32, 64, 128);
-        const int full = z / 8;
+        const __m256i one = _mm256_set1_epi32(1);
+        const __m256i lanes = _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7);
+        const __m256i step = _mm256_set1_epi32(8);
+        const int full = z / 32;
         for (int g = 0; g < full; ++g) {
-            const __m256i b = _mm256_and_si256(_mm256_set1_epi32(bytes[g]), lanes);
-            _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8 * g),
-                                _mm256_srli_epi32(_mm256_cmpeq_epi32(b, lanes), 31));
+            std::uint32_t word;
+            std::memcpy(&word, bytes + 4 * g, sizeof word);
+            const __m256i all = _mm256_set1_epi32(static_cast<int>(word));
+            __m256i shift = lanes;
+            for (int q = 0; q < 4; ++q) {
+                _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 32 * g + 8 * q),
+                                    _mm256_and_si256(_mm256_srlv_epi32(all, shift), one));
+                shift = _mm256_add_epi32(shift, step);
+            }
         }
-        for (int i = 8 * full; i < z; ++i) out[i] = (bytes[i / 8] >> (i % 8)) & 1;
+        for (int i = 32 * full; i < z; ++i) out[i] = (bytes[i / 8] >> (i % 8)) & 1;
     }
 };
 

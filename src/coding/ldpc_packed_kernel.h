@@ -76,6 +76,21 @@ inline void extractBits(const std::uint64_t* src, int offset, int z, std::uint64
 // Repeats the clean z-bit vector v through the whole column buffer.
 inline void fillPeriodic(std::uint64_t* column, int stride, const std::uint64_t* v, int z) {
     const int used = (z + 63) / 64;
+    if (z >= 64) {
+        // From bit z on, every word repeats the 64 bits found z bits earlier, all of which
+        // are final by then; no read-modify-write passes.
+        const int whole = z / 64;
+        const int rest = z % 64;
+        for (int w = 0; w < whole && w < stride; ++w) column[w] = v[w];
+        if (rest && whole < stride) column[whole] = v[whole] | (column[0] << rest);
+        for (int w = used; w < stride; ++w) {
+            const int from = 64 * w - z;
+            const int q = from / 64;
+            const int s = from % 64;
+            column[w] = s ? (column[q] >> s) | (column[q + 1] << (64 - s)) : column[q];
+        }
+        return;
+    }
     for (int w = 0; w < stride; ++w) column[w] = 0;
     for (int pos = 0; pos < stride * 64; pos += z) {
         const int q = pos / 64;

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
+#include <iterator>
 #include <random>
 #include <string>
 #include <vector>
@@ -141,10 +143,19 @@ TEST(LdpcEncoder, PackedKernelsDeferOddInputsToTheListForm) {
     LDPC_Encoder encoder;
     ASSERT_TRUE(encoder.Initialize(1, 16));
     std::mt19937 rng(9);
-    for (int variant = 0; variant < 2; ++variant) {
+    // Odd values whose low byte or low half-word would read as 0, 1 or -2 if a kernel narrowed
+    // by truncation; K is 160, so the places lie in both halves of a packed word and the tail.
+    const int oddValues[] = {5, -1, 2, 254, 256, 0x10001, -0x10002, INT_MIN, INT_MAX};
+    const int places[] = {50, 100, 150};
+    const int variants = static_cast<int>(std::size(oddValues) * std::size(places)) + 1;
+    for (int variant = 0; variant < variants; ++variant) {
         auto info = randomBits(static_cast<std::size_t>(encoder.K), rng);
-        if (variant == 0) info[50] = 5;
-        if (variant == 1) info[3] = -2;
+        if (variant + 1 == variants) {
+            info[3] = -2;
+        } else {
+            info[static_cast<std::size_t>(places[variant % std::size(places)])] =
+                oddValues[static_cast<std::size_t>(variant) / std::size(places)];
+        }
         auto listIn = info;
         std::vector<int> expected(static_cast<std::size_t>(encoder.N));
         ASSERT_TRUE(encoder.RunWith(LdpcKernel::List, listIn, expected));
