@@ -169,7 +169,7 @@ std::vector<int> PolarCoding::minimumWeightPositions(int K, int nPCwm) const {
     return chosen;
 }
 
-bool PolarCoding::Encode(BitSequence c, BitSequence& d) {
+bool PolarCoding::Encode(const BitSequence& c, BitSequence& d) {
     if (d.size() != static_cast<std::size_t>(N)) {
         ErrorMessage = "u size error";
         return false;

@@ -42,7 +42,7 @@ class PolarCoding {
 
     /// d = u G_N for the K bits of c; d must hold N elements, else "u size error" and false.
     /// Throws std::invalid_argument when c holds fewer than K bits.
-    bool Encode(BitSequence c, BitSequence& d);
+    bool Encode(const BitSequence& c, BitSequence& d);
 
     /// There is no receiver in this library.
     bool Decode() { return true; }

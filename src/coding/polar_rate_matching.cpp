@@ -48,7 +48,7 @@ bool RateMatchingPolar::Init(int K, int E, int nMax, int bitInterleave) {
     return true;
 }
 
-bool RateMatchingPolar::Go(BitSequence d, BitSequence& f) {
+bool RateMatchingPolar::Go(const BitSequence& d, BitSequence& f) {
     if (f.size() != SelectionMap.size())
         throw std::invalid_argument("f holds " + std::to_string(f.size()) + " bits, E is " +
                                     std::to_string(SelectionMap.size()));

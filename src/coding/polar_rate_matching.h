@@ -26,7 +26,7 @@ class RateMatchingPolar {
 
     /// f(i) = d(SelectionMap(i)). f must hold E elements and d the N encoder output bits;
     /// otherwise std::invalid_argument is thrown.
-    bool Go(BitSequence d, BitSequence& f);
+    bool Go(const BitSequence& d, BitSequence& f);
 
   private:
     std::size_t codeLength_ = 0;  // N, the length d must have

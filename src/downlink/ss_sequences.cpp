@@ -78,7 +78,8 @@ void Generate_PBCH_DMRS_Signal(int iSsb, int cellId, int nHf, std::vector<comple
     const int iBar = swapIndex ? nHf + 4 * iSsb : iSsb + 4 * nHf;
     // 2^11 (iBar + 1)(floor(N/4) + 1) + 2^6 (iBar + 1) + (N mod 4)
     const int cInit = ((((cellId / 4) + 1) << 11) | 64) * (iBar + 1) + cellId % 4;
-    BitSequence c(2 * kPbchDmrsLength);
+    // Called per SS block: the scratch is made once per thread, not per call.
+    thread_local BitSequence c(2 * kPbchDmrsLength);
     PN_Generator(c, 2 * kPbchDmrsLength, cInit);
     constexpr double a = 0.7071067811865476;
     for (int m = 0; m < kPbchDmrsLength; ++m)
