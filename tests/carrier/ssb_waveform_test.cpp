@@ -1,6 +1,5 @@
-// An SS burst end to end: the example waveform generated through the C interface and
-// demodulated as a receiver does, with the synchronisation signals computed here from
-// TS 38.211 clause 7.4.2.
+// An SS burst end to end: the example waveforms generated through the C interface and
+// demodulated as a receiver does, against PSS, SSS and PBCH DM-RS computed from TS 38.211.
 
 #include <gtest/gtest.h>
 
@@ -8,197 +7,162 @@
 #include <complex>
 #include <fstream>
 #include <numbers>
-#include <sstream>
 #include <vector>
 
 #include "../engine/output_files.h"
 #include "../engine/waveform_test_support.h"
+#include "downlink/ssb_reference.h"
 #include "test_support.h"
 
 namespace {
 
 using Sample = std::complex<double>;
 
-std::vector<int> mSequence(std::vector<int> x, int tapA, int tapB) {  // x(i+7) = x(i+tapA) + x(i+tapB)
-    for (int i = 0; i + 7 < 127; ++i) x.push_back((x[static_cast<std::size_t>(i + tapA)] + x[static_cast<std::size_t>(i + tapB)]) % 2);
-    return x;
-}
-
-std::vector<double> pss(int nId2) {  // clause 7.4.2.2
-    const auto x = mSequence({0, 1, 1, 0, 1, 1, 1}, 4, 0);
-    std::vector<double> d(127);
-    for (int n = 0; n < 127; ++n) d[static_cast<std::size_t>(n)] = 1 - 2 * x[static_cast<std::size_t>((n + 43 * nId2) % 127)];
-    return d;
-}
-
-std::vector<double> sss(int nId1, int nId2) {  // clause 7.4.2.3
-    const auto x0 = mSequence({1, 0, 0, 0, 0, 0, 0}, 4, 0);
-    const auto x1 = mSequence({1, 0, 0, 0, 0, 0, 0}, 1, 0);
-    const int m0 = 15 * (nId1 / 112) + 5 * nId2;
-    const int m1 = nId1 % 112;
-    std::vector<double> d(127);
-    for (int n = 0; n < 127; ++n)
-        d[static_cast<std::size_t>(n)] = (1 - 2 * x0[static_cast<std::size_t>((n + m0) % 127)]) *
-                                         (1 - 2 * x1[static_cast<std::size_t>((n + m1) % 127)]);
-    return d;
-}
-
-/// Receiver view of one OFDM symbol: the FFT window starts halfway into the cyclic prefix, and
-/// the linear phase that this advance gives is taken out again. Returns subcarrier k.
-struct Demodulator {
-    const std::vector<Sample>& samples;
+/// One frame as a receiver sees it: the FFT window starts halfway into each cyclic prefix, and
+/// the linear phase that this advance gives is taken out again.
+struct Receiver {
+    std::vector<Sample> samples;
     int fftSize;
-    std::vector<long> symbolStart;  // first sample of each symbol's prefix
+    std::vector<long> start;  // first sample of each symbol's prefix
     std::vector<int> prefix;
 
-    Sample resourceElement(int symbol, int k) const {
-        const int advance = prefix[static_cast<std::size_t>(symbol)] / 2;
-        const long begin = symbolStart[static_cast<std::size_t>(symbol)] + prefix[static_cast<std::size_t>(symbol)] - advance;
+    Receiver(std::vector<Sample> frame, int size, int mu)
+        : samples(std::move(frame)), fftSize(size) {
+        const int up = static_cast<int>(samples.size() / 307200);  // times 30.72 MHz
+        long position = 0;
+        for (int l = 0; l < 140 << mu; ++l) {
+            start.push_back(position);
+            prefix.push_back(size * 9 / 128 + (l % (7 << mu) == 0 ? 16 * up : 0));
+            position += prefix.back() + size;
+        }
+    }
+
+    /// Subcarrier k (negative below the centre) of symbol l.
+    Sample at(int l, int k) const {
+        const int advance = prefix[l] / 2, bin = (k % fftSize + fftSize) % fftSize;
+        const long begin = start[l] + prefix[l] - advance;
         Sample sum{};
         for (int n = 0; n < fftSize; ++n)
-            sum += samples[static_cast<std::size_t>(begin + n)] *
-                   std::polar(1.0, -2.0 * std::numbers::pi * k * n / fftSize);
-        return sum * std::polar(1.0, 2.0 * std::numbers::pi * k * advance / fftSize);
+            sum +=
+                samples[begin + n] * std::polar(1.0, -2.0 * std::numbers::pi * bin * n / fftSize);
+        return sum * std::polar(1.0, 2.0 * std::numbers::pi * bin * advance / fftSize);
     }
 };
 
-/// Error vector magnitude in dB after the best complex gain; the gain is returned in `gain`.
-double evmDb(const std::vector<Sample>& received, const std::vector<double>& reference, Sample& gain) {
+/// Error vector magnitude in dB after the best complex gain, which is returned in `gain`.
+template <class T>
+double evmDb(const std::vector<Sample>& received, const std::vector<T>& reference, Sample& gain) {
     Sample cross{};
-    double energy = 0.0;
+    double energy = 0.0, error = 0.0;
     for (std::size_t i = 0; i < reference.size(); ++i) {
-        cross += received[i] * reference[i];
-        energy += reference[i] * reference[i];
+        cross += received[i] * std::conj(Sample(reference[i]));
+        energy += std::norm(Sample(reference[i]));
     }
     gain = cross / energy;
-    double error = 0.0;
-    for (std::size_t i = 0; i < reference.size(); ++i) error += std::norm(received[i] - gain * reference[i]);
+    for (std::size_t i = 0; i < reference.size(); ++i)
+        error += std::norm(received[i] - gain * Sample(reference[i]));
     return 10.0 * std::log10(error / (std::norm(gain) * energy));
 }
 
-nlohmann::json readExample(const char* name) {
-    const auto example = nrsynth_test::sourceDir() / "examples" / name;
-    std::ifstream in(example);
-    std::stringstream text;
-    text << in.rdbuf();
-    auto document = nlohmann::json::parse(text.str());
+nlohmann::json example(const char* name) {
+    std::ifstream in(nrsynth_test::sourceDir() / "examples" / name);
+    auto document = nlohmann::json::parse(in);
     document["NumberOfFrames"] = 1;
     return document;
 }
 
-/// Symbol starts of one frame at 30.72 MHz times `up`, for 15 kHz (`mu` 0) or 30 kHz.
-Demodulator frameDemodulator(const std::vector<Sample>& samples, int fftSize, int up, int mu) {
-    Demodulator demodulator{samples, fftSize, {}, {}};
-    long position = 0;
-    const int symbolsPerHalfSubframe = 7 << mu;
-    for (int s = 0; s < 140 << mu; ++s) {
-        demodulator.symbolStart.push_back(position);
-        demodulator.prefix.push_back(fftSize * 9 / 128 + (s % symbolsPerHalfSubframe == 0 ? 16 * up : 0));
-        position += demodulator.prefix.back() + fftSize;
+/// Checks PSS and SSS of the block whose first symbol is `l` and whose centre is subcarrier
+/// `centre` (block subcarrier 120); returns the PSS gain.
+Sample checkSync(const Receiver& rx, int cellId, int centre, int l) {
+    std::vector<Sample> pss, sss;
+    for (int n = 0; n < 127; ++n) {  // block subcarriers 56..182
+        pss.push_back(rx.at(l, centre - 64 + n));
+        sss.push_back(rx.at(l + 2, centre - 64 + n));
     }
-    return demodulator;
-}
-
-/// Gain of the PSS of the block whose first symbol is `first`, after checking its EVM.
-double pssLevel(const Demodulator& demodulator, int cellId, int blockStart, int first) {
-    std::vector<Sample> received;
-    for (int n = 0; n < 127; ++n)
-        received.push_back(demodulator.resourceElement(first, ((blockStart + 56 + n) % demodulator.fftSize + demodulator.fftSize) % demodulator.fftSize));
-    Sample gain;
-    EXPECT_LT(evmDb(received, pss(cellId % 3), gain), -40.0) << "PSS at symbol " << first;
-    return std::abs(gain);
+    Sample pssGain, sssGain;
+    EXPECT_LT(evmDb(pss, ssb_ref::pss(cellId % 3), pssGain), -40.0) << "PSS at symbol " << l;
+    EXPECT_LT(evmDb(sss, ssb_ref::sss(cellId / 3, cellId % 3), sssGain), -40.0) << l;
+    EXPECT_NEAR(std::abs(sssGain), std::abs(pssGain), 0.01) << "SSS at symbol " << l;
+    return pssGain;
 }
 
 TEST(SsBurstWaveform, CaseABurstIsScaledWhenSeveralCarriersAreSummed) {
     // 15 kHz is scaled by 1 / sqrt(2^0 x 0.5) once a second carrier exists, enabled or not.
-    auto single = readExample("ssb_case_a_15khz.json");
+    const auto single = example("ssb_case_a_15khz.json");
     auto withSecond = single;
     withSecond["NRCarriers"].push_back({{"CarrierType", "CW"}, {"Enabled", false}});
     double levels[2] = {};
-    int index = 0;
-    for (const auto* document : {&single, &withSecond}) {
+    for (int i = 0; i < 2; ++i) {
+        const auto& document = i ? withSecond : single;
         nrsynth_test::ScratchFolder folder;
-        const auto path = folder.file("a.bin");
-        ASSERT_EQ(nrsynth_test::generate(*document, path), 0) << GetLog();
-        const auto samples = nrsynth_test::readSamples(path);
-        ASSERT_EQ(samples.size(), 307200u);
-        const auto demodulator = frameDemodulator(samples, 2048, 1, 0);
-        const int cellId = (*document)["NRCarriers"][0]["CellID"];
-        const int blockStart = (*document)["NRCarriers"][0]["Downlink"]["SSPBCH"]["FrequencyOffset"].get<int>() - 120;
-        // Case A, Lmax 4: first symbols 2, 8, 16, 22.
-        for (int first : {2, 8, 16, 22}) levels[index] = pssLevel(demodulator, cellId, blockStart, first);
-        ++index;
+        ASSERT_EQ(nrsynth_test::generate(document, folder.file("a.bin")), 0) << GetLog();
+        const Receiver rx(nrsynth_test::readSamples(folder.file("a.bin")), 2048, 0);
+        ASSERT_EQ(rx.samples.size(), 307200u);
+        const auto& carrier = document["NRCarriers"][0];
+        for (int l : {2, 8, 16, 22})  // Case A, Lmax 4
+            levels[i] = std::abs(checkSync(rx, carrier["CellID"],
+                                           carrier["Downlink"]["SSPBCH"]["FrequencyOffset"], l));
     }
     EXPECT_NEAR(levels[0], 1.0, 0.05);
     EXPECT_NEAR(levels[1] / levels[0], std::sqrt(2.0), 1e-6);
 }
 
-TEST(SsBurstWaveform, CaseCBurstCarriesPssAndSssAtItsCandidateSymbols) {
-    auto document = readExample("ssb_case_c_30khz.json");
-
+TEST(SsBurstWaveform, CaseCBurstAwayFromTheCentreCarriesItsBlocksAndMarkers) {
+    const auto document = example("ssb_case_c_30khz.json");
     nrsynth_test::ScratchFolder folder;
     const auto path = folder.file("ssb.bin");
     ASSERT_EQ(nrsynth_test::generate(document, path), 0) << GetLog();
-    const auto samples = nrsynth_test::readSamples(path);
-    ASSERT_EQ(samples.size(), 1228800u);
-
     // 30 kHz at 122.88 MHz: 4096-point symbols, prefix 288, 352 on the first of each half subframe.
-    const auto demodulator = frameDemodulator(samples, 4096, 4, 1);
-    ASSERT_EQ(demodulator.symbolStart.back() + demodulator.prefix.back() + 4096, 1228800);
+    const Receiver rx(nrsynth_test::readSamples(path), 4096, 1);
+    ASSERT_EQ(rx.samples.size(), 1228800u);
+    ASSERT_EQ(rx.start.back() + rx.prefix.back() + 4096, 1228800);
 
     const int cellId = document["NRCarriers"][0]["CellID"];
-    const int blockStart = document["NRCarriers"][0]["Downlink"]["SSPBCH"]["FrequencyOffset"].get<int>() - 120;
-    const auto expectedPss = pss(cellId % 3);
-    const auto expectedSss = sss(cellId / 3, cellId % 3);
-    auto column = [&](int n) { return ((blockStart + 56 + n) % 4096 + 4096) % 4096; };
-
+    const int centre = document["NRCarriers"][0]["Downlink"]["SSPBCH"]["FrequencyOffset"];
+    const int blockStart = centre - 120, v = cellId % 4;
     // Case C, Lmax 8: first symbols {2, 8} + 14 n, n = 0..3 (TS 38.213 clause 4.1).
-    for (int first : {2, 8, 16, 22, 30, 36, 44, 50}) {
-        std::vector<Sample> pssReceived, sssReceived;
-        for (int n = 0; n < 127; ++n) {
-            pssReceived.push_back(demodulator.resourceElement(first, column(n)));
-            sssReceived.push_back(demodulator.resourceElement(first + 2, column(n)));
+    const int firsts[] = {2, 8, 16, 22, 30, 36, 44, 50};
+    for (int i = 0; i < 8; ++i) {
+        const int l = firsts[i];
+        const Sample pssGain = checkSync(rx, cellId, centre, l);
+        EXPECT_NEAR(std::abs(pssGain), 1.0, 0.05) << l;  // level 1, filter passband near 1
+        // DM-RS r(m) of symbol l + 1 on subcarrier 4 m + v, every fourth one, i-bar = i.
+        const auto ref = ssb_ref::pbchDmrs(i, cellId);
+        std::vector<Sample> dmrs, expected;
+        for (int m = 0; m < 60; m += 4) {
+            dmrs.push_back(rx.at(l + 1, blockStart + 4 * m + v));
+            expected.push_back(ref[m]);
         }
-        Sample pssGain, sssGain;
-        EXPECT_LT(evmDb(pssReceived, expectedPss, pssGain), -40.0) << "PSS of the block at symbol " << first;
-        EXPECT_LT(evmDb(sssReceived, expectedSss, sssGain), -40.0) << "SSS of the block at symbol " << first;
-        EXPECT_NEAR(std::abs(pssGain), 1.0, 0.05) << first;  // level 1, filter passband near 1
-        EXPECT_NEAR(std::abs(sssGain), std::abs(pssGain), 0.01) << first;
-
-        // PBCH DM-RS sit on every fourth subcarrier from v = cell id mod 4, unit magnitude.
-        const int v = cellId % 4;
-        for (int k = v; k < 240; k += 4 * 17) {
-            const auto dmrs = demodulator.resourceElement(first + 1, ((blockStart + k) % 4096 + 4096) % 4096);
-            EXPECT_NEAR(std::abs(dmrs), std::abs(pssGain), 0.02) << "DM-RS at block column " << k;
-        }
+        Sample gain;
+        EXPECT_LT(evmDb(dmrs, expected, gain), -40.0) << "DM-RS at symbol " << l + 1;
+        EXPECT_NEAR(std::abs(gain), std::abs(pssGain), 0.02) << l;
     }
     // Symbols without a block stay empty at the block's columns.
-    for (int symbol : {0, 1, 6, 60, 200}) EXPECT_LT(std::abs(demodulator.resourceElement(symbol, column(60))), 1e-3) << symbol;
+    for (int l : {0, 1, 6, 60, 200}) EXPECT_LT(std::abs(rx.at(l, centre)), 1e-3) << l;
 
     // Markers (default lines): bit 0 waveform start, bit 1 frame start, bit 2 RF blanking,
     // bit 3 RF ALC. Blanking covers the block symbols widened on both sides by the filter's
     // delay and half the window, 512 + 40 / 2 samples, plus the one sample the comparison
     // "at most" takes in.
     const auto markers = nrsynth_test::readMarkers(path + ".mkr");
-    ASSERT_EQ(markers.size(), samples.size());
+    ASSERT_EQ(markers.size(), rx.samples.size());
     constexpr unsigned char kStarts = 0x03, kBlanking = 0x04, kAlc = 0x08;
     EXPECT_EQ(markers[0] & kStarts, kStarts);
     EXPECT_EQ(markers[15] & kStarts, kStarts);  // 4 samples at 30.72 MHz, 16 here
     EXPECT_EQ(markers[16] & kStarts, 0);
     constexpr int kExtension = 532;
-    auto start = [&](int symbol) { return demodulator.symbolStart[static_cast<std::size_t>(symbol)]; };
-    struct Edge {
-        long sample;
-        bool blanked;
-    } edges[] = {{start(2) - kExtension - 2, false}, {start(2) - kExtension - 1, true}, {start(6) + kExtension, true},
-                 {start(6) + kExtension + 1, false}, {start(8) - kExtension - 1, true}, {start(54) + kExtension, true},
-                 {start(54) + kExtension + 1, false}, {1228799, false}};
-    for (const auto& edge : edges)
-        EXPECT_EQ((markers[static_cast<std::size_t>(edge.sample)] & kBlanking) != 0, edge.blanked) << edge.sample;
+    const auto& start = rx.start;
+    const std::pair<long, bool> edges[] = {
+        {start[2] - kExtension - 2, false},  {start[2] - kExtension - 1, true},
+        {start[6] + kExtension, true},       {start[6] + kExtension + 1, false},
+        {start[8] - kExtension - 1, true},   {start[54] + kExtension, true},
+        {start[54] + kExtension + 1, false}, {1228799, false}};
+    for (auto [sample, blanked] : edges)
+        EXPECT_EQ((markers[sample] & kBlanking) != 0, blanked) << sample;
     // RF ALC follows the burst's symbols exactly, without the widening.
-    EXPECT_EQ(markers[static_cast<std::size_t>(start(3))] & kAlc, kAlc);
-    EXPECT_EQ(markers[static_cast<std::size_t>(start(2) - 1)] & kAlc, 0);
-    EXPECT_EQ(markers[static_cast<std::size_t>(start(6))] & kAlc, 0);
+    EXPECT_EQ(markers[start[3]] & kAlc, kAlc);
+    EXPECT_EQ(markers[start[2] - 1] & kAlc, 0);
+    EXPECT_EQ(markers[start[6]] & kAlc, 0);
 }
 
 }  // namespace

@@ -1,74 +1,73 @@
-// Polar encoder: code length, frozen/information/parity sets and the encoded bits against the
-// plain reading of TS 38.212 clause 5.3.1 in polar_reference.h, and the matrix form.
+// The polar chain against the plain reading of TS 38.212 in polar_reference.h: encoder (code
+// length, frozen/information/parity sets, generator matrix, clause 5.3.1), rate matching with
+// sub-block interleaver, repetition / puncturing / shortening and coded-bit interleaver
+// (clause 5.4.1), and UCI code block segmentation with CRC attachment (clauses 5.2.1,
+// 6.3.1.2.1); then the whole chain against published vectors.
 
 #include "coding/polar_coding.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cctype>
+#include <ostream>
 #include <set>
 #include <sstream>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "coding/crc.h"
 #include "coding/polar_mother_code.h"
+#include "coding/polar_rate_matching.h"
+#include "coding/polar_segmentation.h"
 #include "polar_reference.h"
 
+using Orvalis_NR::CodeBlockSegmentationPolar;
 using Orvalis_NR::PolarCoding;
+using Orvalis_NR::RateMatchingPolar;
 
 namespace {
 
-struct CodeLengthCase {
-    int K, E, nMax, N;
-};
-
-class PolarCodeLength : public ::testing::TestWithParam<CodeLengthCase> {};
-
-TEST_P(PolarCodeLength, MatchesWorkedValues) {
-    const auto& p = GetParam();
-    EXPECT_EQ(Orvalis_NR::polarCodeLength(p.K, p.E, p.nMax), p.N);
-    EXPECT_EQ(polar_ref::codeLength(p.K, p.E, p.nMax), p.N);
+TEST(PolarCodeLength, MatchesWorkedValues) {
+    struct Case {
+        int K, E, nMax, N;
+    };
+    // Worked by hand from clause 5.3.1.
+    const Case cases[] = {{56, 864, 9, 512},      // PBCH: n1 10, n2 9
+                          {56, 864, 10, 512},     // n2 limits
+                          {64, 100, 10, 128},     // 100 > 1.125*64: n1 7
+                          {40, 144, 10, 128},     // 144 <= 1.125*128, K/E < 9/16: n1 7
+                          {90, 144, 10, 256},     // K/E 0.625: n1 8
+                          {81, 144, 10, 256},     // K/E 0.5625 is not below: n1 8
+                          {12, 20, 10, 32},       // n at least 5
+                          {400, 8192, 10, 1024},  // nMax limits
+                          {140, 8192, 9, 512},   {3, 8000, 10, 32}};  // n2 5
+    for (const auto& c : cases) {
+        EXPECT_EQ(Orvalis_NR::polarCodeLength(c.K, c.E, c.nMax), c.N) << c.K << " " << c.E;
+        EXPECT_EQ(polar_ref::codeLength(c.K, c.E, c.nMax), c.N) << c.K << " " << c.E;
+    }
 }
-
-// Worked by hand from clause 5.3.1.
-INSTANTIATE_TEST_SUITE_P(
-    Cases, PolarCodeLength,
-    ::testing::Values(CodeLengthCase{56, 864, 9, 512},   // PBCH: n1 10, n2 9
-                      CodeLengthCase{56, 864, 10, 512},  // n2 limits
-                      CodeLengthCase{64, 100, 10, 128},  // 100 > 1.125*64: n1 7
-                      CodeLengthCase{64, 200, 10, 256},
-                      CodeLengthCase{40, 144, 10, 128},   // 144 <= 1.125*128, K/E < 9/16: n1 7
-                      CodeLengthCase{90, 144, 10, 256},   // K/E 0.625: n1 8
-                      CodeLengthCase{81, 144, 10, 256},   // K/E 0.5625 is not below: n1 8
-                      CodeLengthCase{100, 400, 10, 512},  // UCI
-                      CodeLengthCase{12, 20, 10, 32},     // n at least 5
-                      CodeLengthCase{400, 8192, 10, 1024}, CodeLengthCase{140, 8192, 9, 512},
-                      CodeLengthCase{3, 8000, 10, 32}));  // n2 5
 
 // Cases (K, E) for one link direction. Downlink: nMax 9, interleaver, no parity bits. Uplink:
-// nMax 10, no interleaver, nPC 3 with nPCwm 0 and 1 for small K, nPC 0 otherwise.
+// nMax 10, no interleaver, nPC 3 with nPCwm 0 and 1 for small K, nPC 0 otherwise. Together
+// they reach repetition, puncturing (E above and below 3N/4) and shortening in every form.
 struct EncoderCase {
     int K, E, nMax, iIL, nPC, nPCwm;
+    friend void PrintTo(const EncoderCase& p, std::ostream* os) {
+        *os << "K " << p.K << " E " << p.E << " nMax " << p.nMax << " iIL " << p.iIL << " nPC "
+            << p.nPC << " nPCwm " << p.nPCwm;
+    }
 };
-
-std::string caseName(const ::testing::TestParamInfo<EncoderCase>& info) {
-    const auto& p = info.param;
-    std::ostringstream s;
-    s << "K" << p.K << "_E" << p.E << "_nMax" << p.nMax << "_iIL" << p.iIL << "_nPC" << p.nPC
-      << "_wm" << p.nPCwm;
-    return s.str();
-}
 
 std::vector<EncoderCase> encoderCases() {
     std::vector<EncoderCase> cases;
     auto add = [&](int K, int E, int nMax, int iIL, int nPC, int nPCwm) {
-        // Keep only codes that exist: enough positions remain for K + nPC bits.
-        try {
+        try {  // keep only codes that exist: enough positions remain for K + nPC bits
             polar_ref::sets(K, E, nMax, nPC, nPCwm);
+            cases.push_back({K, E, nMax, iIL, nPC, nPCwm});
         } catch (const std::invalid_argument&) {
-            return;
         }
-        cases.push_back({K, E, nMax, iIL, nPC, nPCwm});
     };
     for (int K : {36, 40, 43, 56, 64, 81, 100, 128, 140, 164})
         for (int E : {K + 3, 72, 100, 108, 144, 200, 216, 300, 432, 500, 864, 1728, 5000})
@@ -84,7 +83,7 @@ std::vector<EncoderCase> encoderCases() {
 
 class PolarEncoder : public ::testing::TestWithParam<EncoderCase> {};
 
-TEST_P(PolarEncoder, SetsMatchClause5312) {
+TEST_P(PolarEncoder, SetsCodeWordsAndRateMatchingFollowTheClauses) {
     const auto& p = GetParam();
     const auto ref = polar_ref::sets(p.K, p.E, p.nMax, p.nPC, p.nPCwm);
     PolarCoding code;
@@ -92,183 +91,235 @@ TEST_P(PolarEncoder, SetsMatchClause5312) {
     ASSERT_EQ(code.N, ref.N);
     EXPECT_EQ(code.InfoSet, ref.info);
     EXPECT_EQ(std::set<int>(code.FrozenSet.begin(), code.FrozenSet.end()), ref.frozen);
-    ASSERT_EQ(code.Status.size(), static_cast<std::size_t>(ref.N));
-    for (int n = 0; n < ref.N; ++n) {
-        const bool info = std::count(ref.info.begin(), ref.info.end(), n) != 0;
-        const int expected = ref.frozen.count(n) ? 1 : ref.parity.count(n) ? 6 : info ? 2 : 0;
-        EXPECT_EQ(code.Status[n], expected) << "position " << n;
-        if (expected == 0) {
-            EXPECT_TRUE(ref.preFrozen.count(n)) << "position " << n;
-        }
-    }
-}
 
-TEST_P(PolarEncoder, EncodesLikeButterflyAndMatrix) {
-    const auto& p = GetParam();
-    PolarCoding code;
-    ASSERT_TRUE(code.Init(p.K, p.E, p.nMax, p.iIL, p.nPC, p.nPCwm));
+    // G_N(i, j), the n-th Kronecker power of [1 0; 1 1], is 1 when j's bits lie in i's.
+    ASSERT_EQ(code.GeneratorColumns.size(), static_cast<std::size_t>(ref.N));
+    int wrong = 0;
+    for (int j = 0; j < ref.N; ++j) {
+        ASSERT_EQ(code.GeneratorColumns[j].size(), static_cast<std::size_t>(ref.N));
+        for (int i = 0; i < ref.N; ++i) wrong += code.GeneratorColumns[j][i] != ((i & j) == j);
+    }
+    EXPECT_EQ(wrong, 0);
+
     std::mt19937 rng(static_cast<unsigned>(p.K * 10007 + p.E));
     for (int trial = 0; trial < 3; ++trial) {
-        const auto c = polar_ref::randomBits(static_cast<std::size_t>(p.K), rng);
+        const auto c = nrsynth_test::randomBits(static_cast<std::size_t>(p.K), rng);
         BitSequence d(static_cast<std::size_t>(code.N), 7);
         ASSERT_TRUE(code.Encode(c, d));
-
         const auto u = polar_ref::encoderInput(c, p.E, p.nMax, p.iIL, p.nPC, p.nPCwm);
         EXPECT_EQ(code.U, u);
         EXPECT_EQ(d, polar_ref::butterfly(u));
-
-        // The matrix form: d(j) = u . column j of G_N, modulo 2.
-        BitSequence matrixForm(d.size());
-        for (std::size_t j = 0; j < d.size(); ++j) {
-            int sum = 0;
-            for (std::size_t i = 0; i < u.size(); ++i) sum += u[i] * code.GeneratorColumns[j][i];
-            matrixForm[j] = static_cast<char>(sum & 1);
+        // Rate matching of the code word with and without the coded-bit interleaver.
+        for (int iBIL : {0, 1}) {
+            RateMatchingPolar rm;
+            ASSERT_TRUE(rm.Init(p.K, p.E, p.nMax, iBIL));
+            BitSequence f(static_cast<std::size_t>(p.E), 7);
+            ASSERT_TRUE(rm.Go(d, f));
+            EXPECT_EQ(f, polar_ref::rateMatch(d, p.K, p.E, iBIL)) << "iBIL " << iBIL;
         }
-        EXPECT_EQ(d, matrixForm);
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Grid, PolarEncoder, ::testing::ValuesIn(encoderCases()), caseName);
+INSTANTIATE_TEST_SUITE_P(Grid, PolarEncoder, ::testing::ValuesIn(encoderCases()));
 
-TEST(PolarEncoderCases, GridCoversEveryFormAndSelection) {
-    // The grid above is only worth its name when every rate-matching branch and parity form
-    // actually occurs in it.
-    std::set<std::string> seen;
-    for (const auto& c : encoderCases()) {
-        const int N = polar_ref::codeLength(c.K, c.E, c.nMax);
-        const auto sel = polar_ref::selection(c.K, c.E, N);
-        const std::string form = c.iIL ? "DL" : c.nPC ? "UL-PC" + std::to_string(c.nPCwm) : "UL";
-        seen.insert(form + "/" + std::to_string(static_cast<int>(sel)));
-        if (sel == polar_ref::Selection::Puncturing)
-            seen.insert(4 * c.E >= 3 * N ? "punct>=3N/4" : "punct<3N/4");
-    }
-    for (const char* form : {"DL", "UL", "UL-PC0", "UL-PC1"})
-        for (int sel = 0; sel < 3; ++sel)
-            EXPECT_TRUE(seen.count(std::string(form) + "/" + std::to_string(sel)))
-                << form << " selection " << sel;
-    EXPECT_TRUE(seen.count("punct>=3N/4"));
-    EXPECT_TRUE(seen.count("punct<3N/4"));
-}
-
-TEST(PolarGenerator, ColumnsAreTheKroneckerPower) {
-    // G_N(i, j) of [1 0; 1 1] to the n-th Kronecker power is 1 exactly when the bits of j are a
-    // subset of the bits of i.
-    for (int E : {32, 64, 128, 256, 512, 1024}) {
-        PolarCoding code;
-        ASSERT_TRUE(code.Init(E / 8, E, 10, 0, 0, 0));  // n2 = log2 E
-        ASSERT_EQ(code.N, E);
-        ASSERT_EQ(code.GeneratorColumns.size(), static_cast<std::size_t>(E));
-        int wrong = 0;
-        for (int j = 0; j < E; ++j) {
-            ASSERT_EQ(code.GeneratorColumns[j].size(), static_cast<std::size_t>(E));
-            for (int i = 0; i < E; ++i) wrong += code.GeneratorColumns[j][i] != ((i & j) == j);
-        }
-        EXPECT_EQ(wrong, 0) << "N " << E;
-    }
-}
-
-TEST(PolarEncoderInterleaver, PatternIsTheTableSubsequence) {
-    PolarCoding code;
-    ASSERT_TRUE(code.Init(164, 864, 9, 1, 0, 0));
-    EXPECT_EQ(code.InterleaverPattern, polar_ref::interleavingPattern());
-    EXPECT_EQ(code.PiMax, polar_ref::interleavingPattern());
-    ASSERT_TRUE(code.Init(56, 864, 9, 1, 0, 0));
-    // Table 5.3.1.1-1 entries of at least 108, less 108, in table order.
-    const std::vector<int> expected = {0,  2,  3,  5,  7,  10, 11, 12, 14, 15, 18, 19, 21, 24,
-                                       26, 30, 31, 32, 1,  4,  6,  8,  13, 16, 20, 22, 25, 27,
-                                       33, 9,  17, 23, 28, 34, 29, 35, 36, 37, 38, 39, 40, 41,
-                                       42, 43, 44, 45, 46, 47, 48, 49, 50, 51, 52, 53, 54, 55};
-    EXPECT_EQ(code.InterleaverPattern, expected);
-    ASSERT_TRUE(code.Init(56, 864, 9, 0, 0, 0));
-    for (int k = 0; k < 56; ++k) EXPECT_EQ(code.InterleaverPattern[k], k);
-}
-
-TEST(PolarEncoderErrors, WrongOutputSizeIsRefused) {
-    PolarCoding code;
-    ASSERT_TRUE(code.Init(56, 864, 9, 1, 0, 0));
-    const BitSequence c(56, 1);
-    for (std::size_t size : {0u, 511u, 513u, 864u}) {
-        BitSequence d(size, 5);
-        code.ErrorMessage.clear();
-        EXPECT_FALSE(code.Encode(c, d));
-        EXPECT_EQ(code.ErrorMessage, "u size error");
-        EXPECT_EQ(d, BitSequence(size, 5));
-    }
-    BitSequence d(512);
-    EXPECT_TRUE(code.Encode(c, d));
-    EXPECT_TRUE(code.Decode());
-}
-
-TEST(PolarEncoderErrors, ImpossibleParametersThrow) {
-    PolarCoding code;
-    EXPECT_THROW(code.Init(0, 100, 9, 1, 0, 0), std::invalid_argument);
-    EXPECT_THROW(code.Init(40, 0, 9, 1, 0, 0), std::invalid_argument);
-    EXPECT_THROW(code.Init(165, 864, 9, 1, 0, 0), std::invalid_argument);  // interleaver max
-    EXPECT_THROW(code.Init(20, 60, 10, 0, 3, 4), std::invalid_argument);   // nPCwm > nPC
-    EXPECT_THROW(code.Init(20, 60, 10, 0, -1, 0), std::invalid_argument);
-    EXPECT_THROW(code.Init(60, 40, 10, 0, 0, 0), std::invalid_argument);      // K > E
-    EXPECT_THROW(code.Init(2000, 8192, 11, 0, 0, 0), std::invalid_argument);  // N 2048
-    EXPECT_NO_THROW(code.Init(165, 864, 10, 0, 0, 0));
-    ASSERT_TRUE(code.Init(56, 864, 9, 1, 0, 0));
-    BitSequence d(512);
-    EXPECT_THROW(code.Encode(BitSequence(55, 0), d), std::invalid_argument);
-}
-
-// The tables read from text: the same "index value" pairs as the JSON data give the same code,
-// an altered text gives an altered code, and a broken text is refused.
-std::string pairsText(const std::vector<int>& values) {
-    std::ostringstream s;
-    for (std::size_t i = 0; i < values.size(); ++i) s << i << ' ' << values[i] << '\n';
-    return s.str();
-}
-
-TEST(PolarTablesText, TextFormReadsTheSameTables) {
-    PolarCoding compiled, text;
-    text.Table5311Text = pairsText(polar_ref::interleavingPattern());
-    text.Table5312Text = pairsText(polar_ref::polarSequence());
-    text.Table54111Text = pairsText(polar_ref::subBlockPattern());
-    ASSERT_TRUE(compiled.Init(56, 300, 9, 1, 0, 0));
-    ASSERT_TRUE(text.Init(56, 300, 9, 1, 0, 0));
-    EXPECT_EQ(text.InfoSet, compiled.InfoSet);
-    EXPECT_EQ(text.InterleaverPattern, compiled.InterleaverPattern);
-    EXPECT_EQ(text.SubBlockPattern, polar_ref::subBlockPattern());
-
-    std::vector<int> q, w;
-    compiled.ReadTable5312(q, w);
-    EXPECT_EQ(q, polar_ref::polarSequence());
-    for (int W = 0; W < 1024; ++W) EXPECT_EQ(w[q[W]], W);
-}
-
-TEST(PolarTablesText, AlteredTextChangesTheCode) {
+// The tables read from text: an altered sequence changes the code, a broken one is refused.
+TEST(PolarTablesText, TextReplacesTheCompiledSequence) {
     auto sequence = polar_ref::polarSequence();
+    auto text = [&] {
+        std::ostringstream s;
+        for (std::size_t i = 0; i < sequence.size(); ++i) s << i << ' ' << sequence[i] << '\n';
+        return s.str();
+    };
     PolarCoding code;
     ASSERT_TRUE(code.Init(20, 64, 10, 0, 0, 0));
     const int leastReliableInfo = code.InfoSet.front();
     const int mostReliableFrozen = code.FrozenSet.back();
     // Swap the two positions in the sequence: the information set follows the text.
-    auto a = std::find(sequence.begin(), sequence.end(), leastReliableInfo);
-    auto b = std::find(sequence.begin(), sequence.end(), mostReliableFrozen);
-    std::iter_swap(a, b);
-    code.Table5312Text = pairsText(sequence);
+    std::iter_swap(std::find(sequence.begin(), sequence.end(), leastReliableInfo),
+                   std::find(sequence.begin(), sequence.end(), mostReliableFrozen));
+    code.Table5312Text = text();
     ASSERT_TRUE(code.Init(20, 64, 10, 0, 0, 0));
     EXPECT_EQ(code.InfoSet.front(), mostReliableFrozen);
     EXPECT_EQ(code.Status[leastReliableInfo], 1);
+
+    sequence[5] = sequence[6];  // not a permutation
+    code.Table5312Text = text();
+    EXPECT_THROW(code.Init(20, 64, 10, 0, 0, 0), std::invalid_argument);
 }
 
-TEST(PolarTablesText, BrokenTextThrows) {
+struct GoCase {
+    int A, segmented;
+    CRC_LengthEnumList crc;
+    int crcLength;
+};
+
+class PolarSegmentationGo : public ::testing::TestWithParam<GoCase> {};
+
+// Segmentation: C blocks of K' = ceil(A / C) data bits, each followed by its check; their
+// data bits, joined, are the payload behind C K' - A leading zeros.
+TEST_P(PolarSegmentationGo, BlocksCarryPayloadAndCheck) {
+    const auto& p = GetParam();
+    std::mt19937 rng(static_cast<unsigned>(p.A));
+    const BitSequence a = nrsynth_test::randomBits(static_cast<std::size_t>(p.A), rng);
+
+    CodeBlockSegmentationPolar seg;
+    seg.Init(p.segmented, p.crc);
+    std::vector<BitSequence> blocks(5, BitSequence(3, 1));  // stale content is replaced
+    ASSERT_TRUE(seg.Go(a, blocks));
+
+    const int C = p.segmented == 1 ? 2 : 1;
+    const int kPrime = (p.A + C - 1) / C;
+    ASSERT_EQ(blocks.size(), static_cast<std::size_t>(C));
+    BitSequence joined;
+    for (const auto& block : blocks) {
+        ASSERT_EQ(block.size(), static_cast<std::size_t>(kPrime + p.crcLength));
+        joined.insert(joined.end(), block.begin(), block.begin() + kPrime);
+        BitSequence remainder(static_cast<std::size_t>(p.crcLength), 1);
+        ASSERT_TRUE(NR_CRC(p.crc, static_cast<int>(block.size()), block, remainder));
+        EXPECT_EQ(remainder, BitSequence(remainder.size(), 0));
+    }
+    BitSequence expected(static_cast<std::size_t>(C * kPrime - p.A), 0);
+    expected.insert(expected.end(), a.begin(), a.end());
+    EXPECT_EQ(joined, expected);
+}
+
+INSTANTIATE_TEST_SUITE_P(Cases, PolarSegmentationGo,
+                         ::testing::Values(GoCase{12, 0, CRC_6, 6}, GoCase{19, 0, CRC_6, 6},
+                                           GoCase{1, 1, CRC_6, 6}, GoCase{360, 0, CRC_11, 11},
+                                           GoCase{361, 1, CRC_11, 11}, GoCase{1706, 1, CRC_11, 11},
+                                           GoCase{140, 0, CRC_24C, 24}));
+
+// One refusal per error path of the three steps.
+TEST(PolarErrors, RefusalsOfSizesAndParameters) {
     PolarCoding code;
-    code.Table54111Text = "0 0 1";
-    EXPECT_THROW(code.Init(20, 64, 10, 0, 0, 0), std::invalid_argument);
-    code.Table54111Text = pairsText(std::vector<int>(31, 0));  // entry 31 missing
-    EXPECT_THROW(code.Init(20, 64, 10, 0, 0, 0), std::invalid_argument);
-    code.Table54111Text.clear();
-    code.Table5311Text = "0 x";
-    EXPECT_THROW(code.Init(20, 64, 10, 0, 0, 0), std::invalid_argument);
-    code.Table5311Text.clear();
-    auto sequence = polar_ref::polarSequence();
-    sequence[5] = sequence[6];  // not a permutation
-    code.Table5312Text = pairsText(sequence);
-    EXPECT_THROW(code.Init(20, 64, 10, 0, 0, 0), std::invalid_argument);
+    ASSERT_TRUE(code.Init(56, 864, 9, 1, 0, 0));
+    BitSequence c(56, 1), wrong(511, 5), d(512, 1);
+    EXPECT_FALSE(code.Encode(c, wrong));
+    EXPECT_EQ(wrong, BitSequence(511, 5));
+    c.resize(55);
+    EXPECT_THROW(code.Encode(c, d), std::invalid_argument);
+    EXPECT_THROW(code.Init(165, 864, 9, 1, 0, 0), std::invalid_argument);  // interleaver max
+    EXPECT_THROW(code.Init(60, 40, 10, 0, 0, 0), std::invalid_argument);   // K > E
+
+    RateMatchingPolar rm;
+    ASSERT_TRUE(rm.Init(56, 864, 9, 0));
+    EXPECT_THROW(rm.Go(d, wrong), std::invalid_argument);
+    EXPECT_THROW(rm.Init(0, 864, 9, 0), std::invalid_argument);
+    rm.Table54111Text = "0 0 1 1 2";
+    EXPECT_THROW(rm.Init(56, 864, 9, 0), std::invalid_argument);
+
+    CodeBlockSegmentationPolar seg;
+    seg.Init(1, CRC_11);
+    std::vector<BitSequence> blocks(2);
+    EXPECT_FALSE(seg.Go({}, blocks));
+    EXPECT_TRUE(blocks.empty());
+}
+
+// The public test vectors in ../shared/testvectors/polar/ (made by other implementations).
+// A case of a polar vector file: the numbers of its header (a trailing word such as "CRC11"
+// is dropped) and its bit lines; linesOf(header) says how many bit lines follow.
+struct PolarCase {
+    std::vector<int> header;
+    std::vector<BitSequence> lines;
+};
+
+template <typename LinesOf>
+std::vector<PolarCase> readCases(const std::string& name, LinesOf linesOf) {
+    auto numbers = [](const std::vector<std::string>& words) {
+        std::vector<int> values;
+        for (const auto& w : words)
+            if (std::isdigit(static_cast<unsigned char>(w[0]))) values.push_back(std::stoi(w));
+        return values;
+    };
+    std::vector<PolarCase> cases;
+    for (const auto& c : nrsynth_test::readVectorCases(
+             "polar/" + name, [&](const auto& h) { return linesOf(numbers(h)); })) {
+        cases.push_back({numbers(c.header), {}});
+        for (const auto& line : c.lines) cases.back().lines.push_back(nrsynth_test::bitsOf(line));
+    }
+    return cases;
+}
+
+const auto kTwoLines = [](const std::vector<int>&) { return 2; };
+
+TEST(PolarVectors, EncoderMatchesPy5gphy) {
+    NRSYNTH_REQUIRE_SHARED();
+    // K E N nMax iIL nPC nPCwm; c; d.
+    const auto cases = readCases("py5gphy_polar_encode.txt", kTwoLines);
+    ASSERT_EQ(cases.size(), 6u);
+    for (const auto& c : cases) {
+        const auto& h = c.header;
+        PolarCoding code;
+        ASSERT_TRUE(code.Init(h[0], h[1], h[3], h[4], h[5], h[6]));
+        ASSERT_EQ(code.N, h[2]);
+        BitSequence d(static_cast<std::size_t>(code.N));
+        ASSERT_TRUE(code.Encode(c.lines[0], d));
+        EXPECT_EQ(d, c.lines[1]) << "K " << h[0] << " E " << h[1];
+    }
+}
+
+TEST(PolarVectors, RateMatchingMatchesPy5gphy) {
+    NRSYNTH_REQUIRE_SHARED();
+    // K E N iBIL; d; f. The vectors do not say nMax: it is the one of 9 and 10 that gives N.
+    const auto cases = readCases("py5gphy_polar_ratematch.txt", kTwoLines);
+    ASSERT_EQ(cases.size(), 6u);
+    for (const auto& c : cases) {
+        const auto& h = c.header;
+        const int nMax = Orvalis_NR::polarCodeLength(h[0], h[1], 10) == h[2] ? 10 : 9;
+        ASSERT_EQ(Orvalis_NR::polarCodeLength(h[0], h[1], nMax), h[2]);
+        RateMatchingPolar rm;
+        ASSERT_TRUE(rm.Init(h[0], h[1], nMax, h[3]));
+        BitSequence f(static_cast<std::size_t>(h[1]));
+        ASSERT_TRUE(rm.Go(c.lines[0], f));
+        EXPECT_EQ(f, c.lines[1]) << "K " << h[0] << " E " << h[1] << " iBIL " << h[3];
+    }
+}
+
+TEST(PolarVectors, SegmentationMatchesPy5gphy) {
+    NRSYNTH_REQUIRE_SHARED();
+    // A E_UCI C E_r K_r L; a; C blocks.
+    const auto cases = readCases("py5gphy_polar_cbsegment.txt",
+                                 [](const std::vector<int>& h) { return 1 + h[2]; });
+    ASSERT_EQ(cases.size(), 6u);
+    for (const auto& c : cases) {
+        const auto& h = c.header;
+        CodeBlockSegmentationPolar seg;
+        seg.Init(h[2] == 2 ? 1 : 0, h[5] == 11 ? CRC_11 : CRC_6);
+        std::vector<BitSequence> blocks;
+        ASSERT_TRUE(seg.Go(c.lines[0], blocks));
+        EXPECT_EQ(blocks, std::vector<BitSequence>(c.lines.begin() + 1, c.lines.end()))
+            << "A " << h[0];
+    }
+}
+
+TEST(PolarVectors, UplinkChainMatchesSionna) {
+    NRSYNTH_REQUIRE_SHARED();
+    // A K E N nMax iIL iBIL nPC nPCwm; a; c = a + CRC11; f.
+    const auto cases = readCases("sionna_polar5g.txt", [](const auto&) { return 3; });
+    ASSERT_EQ(cases.size(), 500u);
+    PolarCoding code;
+    RateMatchingPolar rm;
+    std::vector<int> current;
+    for (const auto& c : cases) {
+        const auto& h = c.header;
+        if (h != current) {  // five configurations of 100 payloads each
+            ASSERT_TRUE(code.Init(h[1], h[2], h[4], h[5], h[7], h[8]));
+            ASSERT_EQ(code.N, h[3]);
+            ASSERT_TRUE(rm.Init(h[1], h[2], h[4], h[6]));
+            current = h;
+        }
+        CodeBlockSegmentationPolar seg;
+        seg.Init(0, CRC_11);
+        std::vector<BitSequence> blocks;
+        ASSERT_TRUE(seg.Go(c.lines[0], blocks));
+        ASSERT_EQ(blocks.size(), 1u);
+        EXPECT_EQ(blocks[0], c.lines[1]);
+
+        BitSequence d(static_cast<std::size_t>(code.N)), f(static_cast<std::size_t>(h[2]));
+        ASSERT_TRUE(code.Encode(blocks[0], d));
+        ASSERT_TRUE(rm.Go(d, f));
+        EXPECT_EQ(f, c.lines[2]) << "A " << h[0] << " E " << h[2];
+    }
 }
 
 }  // namespace

@@ -6,29 +6,19 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
-#include <fstream>
-#include <nlohmann/json.hpp>
 #include <random>
 #include <set>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
-#include "test_support.h"
+#include "vector_file.h"
 
 namespace polar_ref {
 
 using Bits = std::vector<char>;
 
-/// Column 1 of the rows of a table in data/3gpp/ (rows [index, value]).
-inline std::vector<int> tableColumn(const std::string& file) {
-    std::ifstream in(nrsynth_test::sourceDir() / "data" / "3gpp" / file);
-    if (!in) throw std::runtime_error("cannot open " + file);
-    const auto doc = nlohmann::json::parse(in);
-    std::vector<int> values;
-    for (const auto& row : doc.at("rows")) values.push_back(row.at(1).get<int>());
-    return values;
-}
+using nrsynth_test::tableColumn;
 
 inline const std::vector<int>& interleavingPattern() {
     static const auto t = tableColumn("ts38212_table_5_3_1_1_1_polar_interleaving_pattern.json");
@@ -161,18 +151,12 @@ inline Bits rateMatch(const Bits& d, int K, int E, int iBIL) {
     const int N = static_cast<int>(d.size());
     Bits y(d.size());
     for (int n = 0; n < N; ++n) y[n] = d[subBlockJ(n, N)];
+    const Selection sel = selection(K, E, N);
     Bits e(static_cast<std::size_t>(E));
-    switch (selection(K, E, N)) {
-        case Selection::Repetition:
-            for (int k = 0; k < E; ++k) e[k] = y[k % N];
-            break;
-        case Selection::Puncturing:
-            for (int k = 0; k < E; ++k) e[k] = y[k + N - E];
-            break;
-        case Selection::Shortening:
-            for (int k = 0; k < E; ++k) e[k] = y[k];
-            break;
-    }
+    for (int k = 0; k < E; ++k)
+        e[k] = sel == Selection::Repetition   ? y[k % N]
+               : sel == Selection::Puncturing ? y[k + N - E]
+                                              : y[k];  // shortening
     if (iBIL != 1) return e;
     int T = 0;
     while (T * (T + 1) / 2 < E) ++T;
@@ -187,12 +171,6 @@ inline Bits rateMatch(const Bits& d, int K, int E, int iBIL) {
         for (int i = 0; i < T - j; ++i)
             if (v[i][j] != kNull) f.push_back(v[i][j]);
     return f;
-}
-
-inline Bits randomBits(std::size_t n, std::mt19937& rng) {
-    Bits bits(n);
-    for (auto& b : bits) b = static_cast<char>(rng() & 1);
-    return bits;
 }
 
 }  // namespace polar_ref

@@ -2,27 +2,13 @@
 
 #include <gtest/gtest.h>
 
-#include <fstream>
-#include <nlohmann/json.hpp>
-#include <random>
 #include <string>
 
-#include "test_support.h"
 #include "vector_file.h"
 
 namespace {
 
 using Orvalis_NR::SmallBlockCoding;
-
-// Table 5.3.3.3-1 as committed in data/3gpp, read here independently of the generated header.
-std::vector<std::vector<int>> basisFromData() {
-    std::ifstream in(nrsynth_test::sourceDir() / "data" / "3gpp" /
-                     "ts38212_table_5_3_3_3_1_small_block_basis_sequences.json");
-    const auto doc = nlohmann::json::parse(in);
-    std::vector<std::vector<int>> rows;
-    for (const auto& row : doc.at("rows")) rows.emplace_back(row.begin() + 1, row.end());
-    return rows;
-}
 
 BitSequence bitsOfValue(unsigned value, int k) {
     BitSequence c(static_cast<std::size_t>(k));
@@ -33,9 +19,12 @@ BitSequence bitsOfValue(unsigned value, int k) {
 
 class SmallBlockLength : public ::testing::TestWithParam<int> {};
 
+// Table 5.3.3.3-1 as committed in data/3gpp, read here independently of the generated header.
 TEST_P(SmallBlockLength, EveryMessageEqualsTheBasisMatrixProduct) {
     const int k = GetParam();
-    const auto basis = basisFromData();
+    const auto basis =  // rows [i, M_i,0 .. M_i,10]
+        nrsynth_test::dataTable("ts38212_table_5_3_3_3_1_small_block_basis_sequences.json")
+            .at("rows");
     ASSERT_EQ(basis.size(), 32u);
     SmallBlockCoding code;
     ASSERT_TRUE(code.Init(k, 2));
@@ -44,85 +33,64 @@ TEST_P(SmallBlockLength, EveryMessageEqualsTheBasisMatrixProduct) {
         BitSequence c = bitsOfValue(value, k);
         BitSequence d(32, 9);
         ASSERT_TRUE(code.Encode(c, d));
-        for (int i = 0; i < 32; ++i) {
+        for (std::size_t i = 0; i < 32; ++i) {
             int sum = 0;
-            for (int n = 0; n < k; ++n)
-                sum += c[static_cast<std::size_t>(n)] *
-                       basis[static_cast<std::size_t>(i)][static_cast<std::size_t>(n)];
-            ASSERT_EQ(d[static_cast<std::size_t>(i)], sum % 2)
-                << "K=" << k << " value=" << value << " i=" << i;
+            for (std::size_t n = 0; n < c.size(); ++n) sum += c[n] * basis[i][n + 1].get<int>();
+            ASSERT_EQ(d[i], sum % 2) << "K=" << k << " value=" << value << " i=" << i;
         }
     }
 }
 
 INSTANTIATE_TEST_SUITE_P(K3to11, SmallBlockLength, ::testing::Range(3, 12));
 
-struct RepetitionCase {
-    int k;
-    int qm;
-    std::string pattern;  // a, b: c0, c1; s: c0 xor c1; x, y: placeholders
-};
-
-// Tables of TS 38.212 clauses 5.3.3.1 and 5.3.3.2.
-const RepetitionCase kRepetitions[] = {
-    {1, 1, "a"},
-    {1, 2, "ay"},
-    {1, 4, "ayxx"},
-    {1, 6, "ayxxxx"},
-    {1, 8, "ayxxxxxx"},
-    {2, 1, "abs"},
-    {2, 2, "absabs"},
-    {2, 4, "abxxsaxxbsxx"},
-    {2, 6, "abxxxxsaxxxxbsxxxx"},
-    {2, 8, "abxxxxxxsaxxxxxxbsxxxxxx"},
-};
-
+// Tables of TS 38.212 clauses 5.3.3.1 and 5.3.3.2 for Qm 1, 2, 4, 6, 8. a, b: c0, c1;
+// s: c0 xor c1; x, y: the placeholders -1 and -2.
 TEST(SmallBlockCoding, RepetitionTablesOfOneAndTwoBits) {
-    for (const auto& rc : kRepetitions) {
-        for (unsigned value = 0; value < (1u << rc.k); ++value) {
+    const char* patterns[2][5] = {
+        {"a", "ay", "ayxx", "ayxxxx", "ayxxxxxx"},
+        {"abs", "absabs", "abxxsaxxbsxx", "abxxxxsaxxxxbsxxxx", "abxxxxxxsaxxxxxxbsxxxxxx"}};
+    const int qms[5] = {1, 2, 4, 6, 8};
+    for (int k = 1; k <= 2; ++k) {
+        for (int q = 0; q < 5; ++q) {
+            const std::string pattern = patterns[k - 1][q];
             SmallBlockCoding code;
-            code.Init(rc.k, rc.qm);
-            ASSERT_EQ(code.N, static_cast<int>(rc.pattern.size()));
-            BitSequence c = bitsOfValue(value, rc.k);
-            BitSequence d(rc.pattern.size(), 9);
-            ASSERT_TRUE(code.Encode(c, d));
-            for (std::size_t i = 0; i < d.size(); ++i) {
-                const char p = rc.pattern[i];
-                const int expected = p == 'a'   ? c[0]
-                                     : p == 'b' ? c[1]
-                                     : p == 's' ? (c[0] ^ c[1])
-                                     : p == 'x' ? -1
-                                                : -2;
-                EXPECT_EQ(d[i], expected) << "K=" << rc.k << " qm=" << rc.qm << " i=" << i;
+            code.Init(k, qms[q]);
+            ASSERT_EQ(code.N, static_cast<int>(pattern.size()));
+            for (unsigned value = 0; value < (1u << k); ++value) {
+                BitSequence c = bitsOfValue(value, k), d(pattern.size(), 9);
+                ASSERT_TRUE(code.Encode(c, d));
+                BitSequence expected;
+                for (char p : pattern)
+                    expected.push_back(p == 'a'   ? c[0]
+                                       : p == 'b' ? c[1]
+                                       : p == 's' ? c[0] ^ c[1]
+                                       : p == 'x' ? -1
+                                                  : -2);
+                EXPECT_EQ(d, expected) << "K=" << k << " Qm=" << qms[q] << " value=" << value;
             }
         }
     }
 }
 
-TEST(SmallBlockCoding, SizeChecksAndRateMatching) {
+TEST(SmallBlockCoding, RateMatchingRepeatsAndSizesAreChecked) {
     SmallBlockCoding code;
     code.Init(11, 2);
-    BitSequence c12(12), c11(11, 1), d32(32), d31(31);
+    BitSequence c11(11, 1), c12(12), d32(32), d31(31);
     EXPECT_FALSE(code.Encode(c12, d32));
     EXPECT_FALSE(code.Encode(c11, d31));
     ASSERT_TRUE(code.Encode(c11, d32));
     BitSequence f(70, 9);
     ASSERT_TRUE(code.RateMatch(d32, f));
     for (std::size_t i = 0; i < f.size(); ++i) EXPECT_EQ(f[i], d32[i % 32]);
-    BitSequence empty;
-    EXPECT_TRUE(code.RateMatch(d32, empty));
-    BitSequence shortD(5);
-    EXPECT_THROW(code.RateMatch(shortD, f), std::out_of_range);
+    EXPECT_THROW(code.RateMatch(d31, f), std::out_of_range);
     code.Init(12, 2);
-    BitSequence c(12);
-    EXPECT_THROW(code.Encode(c, d32), std::out_of_range);
+    EXPECT_THROW(code.Encode(c12, d32), std::out_of_range);
 }
 
 TEST(SmallBlockCoding, PublishedVectors) {
     NRSYNTH_REQUIRE_SHARED();
-    const auto path =
-        nrsynth_test::sharedDir() / "testvectors" / "smallblock" / "py5gphy_smallblock_encode.txt";
-    const auto cases = nrsynth_test::readVectorCases(path.string(), [](auto&) { return 2; });
+    const auto cases = nrsynth_test::readVectorCases("smallblock/py5gphy_smallblock_encode.txt",
+                                                     [](auto&) { return 2; });
     for (const auto& tc : cases) {
         const int k = std::stoi(tc.header.at(0));
         const int qm = std::stoi(tc.header.at(1));

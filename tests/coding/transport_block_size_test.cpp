@@ -4,37 +4,28 @@
 
 #include <algorithm>
 #include <bit>
-#include <fstream>
-#include <nlohmann/json.hpp>
 #include <stdexcept>
 #include <vector>
 
-#include "test_support.h"
+#include "vector_file.h"
 
 namespace {
 
 using Orvalis_NR::DeterminationTransportBlockSize;
 using Orvalis_NR::TbsFromTable;
 
-// TS 38.214 Table 5.1.3.2-1 read from the committed JSON, apart from the generated header.
+// TS 38.214 Table 5.1.3.2-1 read from the committed JSON.
 const std::vector<int>& jsonTbsTable() {
-    static const std::vector<int> table = [] {
-        std::ifstream file(nrsynth_test::sourceDir() / "data" / "3gpp" /
-                           "ts38214_table_5_1_3_2_1_tbs.json");
-        const auto doc = nlohmann::json::parse(file);
-        std::vector<int> values;
-        for (const auto& row : doc.at("rows")) {
-            values.push_back(row.at(1).get<int>());
-        }
-        return values;
-    }();
+    static const auto table = nrsynth_test::tableColumn("ts38214_table_5_1_3_2_1_tbs.json");
     return table;
 }
 
-int floorLog2(int x) { return std::bit_width(static_cast<unsigned>(x)) - 1; }
+int floorLog2(int x) {
+    return std::bit_width(static_cast<unsigned>(x)) - 1;
+}
 
-// TS 38.214 clause 5.1.3.2 steps 3 and 4 with R above 1/4 and the standard's own C.
-int directTbs(int nInfo) {
+// TS 38.214 clause 5.1.3.2 steps 3 and 4 with R above 1/4; `blocks` receives its C.
+int directTbs(int nInfo, int* blocks = nullptr) {
     if (nInfo <= 3824) {
         const int n = std::max(3, floorLog2(nInfo) - 6);
         const int quantised = std::max(24, (1 << n) * (nInfo >> n));
@@ -43,6 +34,7 @@ int directTbs(int nInfo) {
     const int n = floorLog2(nInfo - 24) - 5;
     const int quantised = std::max(3840, (1 << n) * ((nInfo - 24 + (1 << (n - 1))) >> n));
     const int c = quantised > 8424 ? (quantised + 24 + 8423) / 8424 : 1;
+    if (blocks) *blocks = c;
     return 8 * c * ((quantised + 24 + 8 * c - 1) / (8 * c)) - 24;
 }
 
@@ -69,11 +61,8 @@ TEST(TransportBlockSize, FollowsTheClauseOverAllBands) {
         for (int a : {1, 2, 4, 6, 8}) {
             for (int b = 1; b <= 4; ++b) {
                 const int nInfo = static_cast<int>(bandRe[band] * 0.92578125 * a * b);
-                const int expected = directTbs(nInfo);
-                const int n = floorLog2(nInfo - 24) - 5;
-                const int quantised =
-                    std::max(3840, (1 << n) * ((nInfo - 24 + (1 << (n - 1))) >> n));
-                const int c = (quantised + 24 + 8423) / 8424;
+                int c = 0;
+                const int expected = directTbs(nInfo, &c);
                 for (int prbs : {bandPrbs[band], band < 6 ? bandPrbs[band + 1] - 1 : 275}) {
                     int tbs = 0;
                     ASSERT_TRUE(DeterminationTransportBlockSize(tbs, c, a, b, prbs));
@@ -85,11 +74,8 @@ TEST(TransportBlockSize, FollowsTheClauseOverAllBands) {
 }
 
 TEST(TransportBlockSize, SmallInformationSizesUseTheTable) {
-    EXPECT_EQ(TbsFromTable(1), 24);
     EXPECT_EQ(TbsFromTable(100), 96);
-    EXPECT_EQ(TbsFromTable(1000), 1032);
     EXPECT_EQ(TbsFromTable(2990), 2976);
-    EXPECT_EQ(TbsFromTable(3824), 3824);
     for (int nInfo = 1; nInfo <= 3824; ++nInfo) {
         ASSERT_EQ(TbsFromTable(nInfo), directTbs(nInfo)) << "N_info " << nInfo;
     }

@@ -59,44 +59,34 @@ struct TransformCase {
 std::vector<TransformCase> transformCases() {
     std::vector<TransformCase> cases;
     for (int w = 0; w < 3; ++w)
-        for (int n : {1, 2, 3, 5, 8, 12, 30, 64, 100, 128, 243, 1000, 1024, 1536, 2048})
+        for (int n : {1, 2, 3, 5, 8, 12, 30, 64, 100, 243, 1000, 1024, 1536, 2048})
             if (!kWrappers[w].powerOfTwoOnly || Orvalis_NR::isPowerOfTwo(n))
                 cases.push_back({w, n});
     return cases;
 }
 
-class TransformAgainstDirectSum : public ::testing::TestWithParam<TransformCase> {
-  protected:
-    const Wrapper& wrapper() const { return kWrappers[GetParam().wrapper]; }
-    int size() const { return GetParam().size; }
-};
+class TransformAgainstDirectSum : public ::testing::TestWithParam<TransformCase> {};
 
-TEST_P(TransformAgainstDirectSum, ForwardIsUnscaledAndInverseDividesByLength) {
-    const int n = size();
+TEST_P(TransformAgainstDirectSum, ForwardUnscaledInverseOverLengthInPlaceAndMisaligned) {
+    const Wrapper& wrapper = kWrappers[GetParam().wrapper];
+    const int n = GetParam().size;
     const Samples x = randomSamples(n, 17u + n);
     Samples forward(n), inverse(n);
-    wrapper().run(n, false, raw(x), raw(forward));
-    wrapper().run(n, true, raw(x), raw(inverse));
-
-    const Samples expectedForward = directDft(x);
-    const Samples expectedInverse = directIdft(x);
-    EXPECT_LE(maxAbsDifference(forward, expectedForward), tolerance(expectedForward));
-    EXPECT_LE(maxAbsDifference(inverse, expectedInverse), tolerance(expectedInverse));
-}
-
-TEST_P(TransformAgainstDirectSum, InPlaceAndMisalignedBuffersGiveTheSameResult) {
-    const int n = size();
-    const Samples x = randomSamples(n, 5u + n);
+    wrapper.run(n, false, raw(x), raw(forward));
+    wrapper.run(n, true, raw(x), raw(inverse));
     const Samples expected = directDft(x);
+    const Samples expectedInverse = directIdft(x);
+    EXPECT_LE(maxAbsDifference(forward, expected), tolerance(expected));
+    EXPECT_LE(maxAbsDifference(inverse, expectedInverse), tolerance(expectedInverse));
 
     Samples inPlace = x;
-    wrapper().run(n, false, raw(inPlace), raw(inPlace));
+    wrapper.run(n, false, raw(inPlace), raw(inPlace));
     EXPECT_LE(maxAbsDifference(inPlace, expected), tolerance(expected));
 
     // Shifted by one double: the interleaved data no longer meets the planned alignment.
     std::vector<double> in(2 * n + 1), out(2 * n + 3);
     std::copy(raw(x), raw(x) + 2 * n, in.begin() + 1);
-    wrapper().run(n, false, in.data() + 1, out.data() + 1);
+    wrapper.run(n, false, in.data() + 1, out.data() + 1);
     EXPECT_LE(
         maxAbsDifference(reinterpret_cast<const Complex*>(out.data() + 1), expected.data(), n),
         tolerance(expected));
@@ -110,37 +100,6 @@ INSTANTIATE_TEST_SUITE_P(Sizes, TransformAgainstDirectSum, ::testing::ValuesIn(t
                                     std::to_string(info.param.size);
                          });
 
-TEST(TransformWrappers, RoundTripOfTheRowLengthUsedAt122MHz) {
-    FFT fft;
-    fft.Init(4096);
-    EXPECT_EQ(fft.order(), 12);
-    const Samples x = randomSamples(4096, 3);
-    Samples spectrum(4096), back(4096);
-    fft.ForwardFFT(raw(x), raw(spectrum));
-    fft.InverseFFT(raw(spectrum), raw(back));
-    EXPECT_LE(maxAbsDifference(back, x), 1e-14);
-}
-
-TEST(TransformWrappers, InverseWithFactorScalesTheInverse) {
-    const Complex factor = std::polar(1.0, 0.9) * 3.0;
-    for (int n : {16, 15}) {
-        const Samples x = randomSamples(n, 21);
-        Samples expected = directIdft(x);
-        for (auto& v : expected) v *= factor;
-        Samples y(n);
-        if (n == 16) {
-            FFT fft;
-            fft.Init(n);
-            fft.InverseFFT(raw(x), raw(y), factor);
-        } else {
-            DFT dft;
-            dft.Init(n);
-            dft.InverseDFT(raw(x), raw(y), factor);
-        }
-        EXPECT_LE(maxAbsDifference(y, expected), 1e-12) << n;
-    }
-}
-
 TEST(TransformWrappers, CopiesPlanTheirOwnTransform) {
     FFT original;
     original.Init(16);
@@ -150,63 +109,31 @@ TEST(TransformWrappers, CopiesPlanTheirOwnTransform) {
     Samples y(16);
     copy.ForwardFFT(raw(x), raw(y));
     EXPECT_LE(maxAbsDifference(y, directDft(x)), 1e-12);
-
-    FFT moved = std::move(copy);
-    EXPECT_EQ(moved.size(), 16);
-    EXPECT_EQ(copy.size(), 0);  // NOLINT(bugprone-use-after-move): a moved-from FFT is unsized
 }
 
-TEST(TransformWrappers, RefuseBadLengthsAndUnsetState) {
+TEST(TransformWrappers, RefuseBadLengthsUnsetStateAndOverlap) {
     FFT fft;
     DFT dft;
     EXPECT_THROW(fft.Init(12), std::invalid_argument);
-    EXPECT_THROW(fft.Init(0), std::invalid_argument);
     EXPECT_THROW(dft.Init(0), std::invalid_argument);
-    EXPECT_THROW(dft.Init(-3), std::invalid_argument);
     Samples x(4), y(4);
     EXPECT_THROW(fft.ForwardFFT(raw(x), raw(y)), std::invalid_argument);
-    EXPECT_THROW(dft.InverseDFT(raw(x), raw(y)), std::invalid_argument);
     fft.Init(4);
-    EXPECT_THROW(fft.ForwardFFT(nullptr, raw(y)), std::invalid_argument);
     // Partly overlapping buffers cannot be transformed; equal ones can.
     Samples z(6);
     EXPECT_THROW(fft.ForwardFFT(raw(z), raw(z) + 2), std::invalid_argument);
     EXPECT_NO_THROW(fft.ForwardFFT(raw(z), raw(z)));
 }
 
-TEST(IppDftChoice, PowerOfTwoUsesFftOthersDft) {
-    IppDft dft;
-    EXPECT_EQ(dft.size(), 0);
-    dft.resize(12);
-    EXPECT_EQ(dft.size(), 12);
-    EXPECT_TRUE(dft.dftTransform && !dft.fftTransform);
-    dft.resize(16);
-    EXPECT_TRUE(dft.fftTransform && !dft.dftTransform);
-    dft.resize(1);
-    EXPECT_TRUE(dft.fftTransform && !dft.dftTransform);
-    EXPECT_THROW(dft.resize(0), std::invalid_argument);
-}
-
-TEST(IppDftChoice, SpanFormsResizeToTheirLengthAndRefuseUnequalSpans) {
+TEST(IppDftSpans, SpanFormsResizeToTheirLengthAndRefuseUnequalSpans) {
     IppDft dft(8);
     const Samples x = randomSamples(10, 4);
-    Samples y(10);
+    Samples y(10), shorter(9);
     dft.dft(gsl::span<const Complex>(x), gsl::span<Complex>(y));
     EXPECT_EQ(dft.size(), 10);
     EXPECT_LE(maxAbsDifference(y, directDft(x)), 1e-12);
-    Samples back(10);
-    dft.idft(gsl::span<const Complex>(y), gsl::span<Complex>(back));
-    EXPECT_LE(maxAbsDifference(back, x), 1e-14);
-
-    Samples shorter(9);
-    try {
-        dft.dft(gsl::span<const Complex>(x), gsl::span<Complex>(shorter));
-        FAIL() << "unequal spans accepted";
-    } catch (const std::invalid_argument& e) {
-        EXPECT_STREQ(e.what(), "input");
-    }
-    IppDft unsized;
-    EXPECT_THROW(unsized.dft(y.data(), y.data()), std::invalid_argument);
+    EXPECT_THROW(dft.dft(gsl::span<const Complex>(x), gsl::span<Complex>(shorter)),
+                 std::invalid_argument);
 }
 
 }  // namespace

@@ -1,8 +1,6 @@
 #pragma once
 // Helpers for tests that make waveform files: a scratch folder and readers of the raw formats.
 
-#include <gtest/gtest.h>
-
 #include <unistd.h>
 
 #include <atomic>
@@ -17,11 +15,11 @@ namespace nrsynth_test {
 
 /// A fresh folder under the system's temporary folder, removed with the object.
 class ScratchFolder {
-public:
+  public:
     ScratchFolder() {
         static std::atomic<int> counter{0};
-        const auto name = "nrsynth_test_" + std::to_string(::getpid()) + "_" + std::to_string(counter++);
-        path_ = std::filesystem::temp_directory_path() / name;
+        path_ = std::filesystem::temp_directory_path() /
+                ("nrsynth_test_" + std::to_string(::getpid()) + "_" + std::to_string(counter++));
         std::filesystem::remove_all(path_);
         std::filesystem::create_directories(path_);
     }
@@ -35,21 +33,22 @@ public:
     std::string file(const std::string& name) const { return (path_ / name).string(); }
     const std::filesystem::path& path() const { return path_; }
 
-private:
+  private:
     std::filesystem::path path_;
 };
 
-inline std::vector<std::complex<double>> readSamples(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    std::vector<char> bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-    std::vector<std::complex<double>> samples(bytes.size() / sizeof(std::complex<double>));
-    std::memcpy(samples.data(), bytes.data(), samples.size() * sizeof(std::complex<double>));
-    return samples;
-}
-
+/// The bytes of a marker file, one a sample.
 inline std::vector<unsigned char> readMarkers(const std::string& path) {
     std::ifstream in(path, std::ios::binary);
     return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
+
+/// The samples of a raw sample file (complex double).
+inline std::vector<std::complex<double>> readSamples(const std::string& path) {
+    const std::vector<unsigned char> bytes = readMarkers(path);
+    std::vector<std::complex<double>> samples(bytes.size() / sizeof(std::complex<double>));
+    std::memcpy(samples.data(), bytes.data(), samples.size() * sizeof(std::complex<double>));
+    return samples;
 }
 
 }  // namespace nrsynth_test

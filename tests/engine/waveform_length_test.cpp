@@ -1,4 +1,4 @@
-// Length of a waveform from frames, subframes and slot cuts, and the per-antenna file names.
+// Length of a waveform from frames, subframes and slot cuts.
 
 #include <gtest/gtest.h>
 
@@ -9,21 +9,16 @@
 namespace {
 
 using Models::Nr5g::NR5GWaveformSettings;
-using Models::Nr5g::NRCarrier;
 using Models::Nr5g::Numerology;
 using Orvalis_NR::ComputeWaveformLength;
 
 struct LengthCase {
     const char* name;
     double sampleRate;
-    int frames;
-    int subframeOffset;
-    int subframes;
+    int frames, subframeOffset, subframes;
     Numerology numerology;
-    int slotOffset;
-    int slotCount;
-    int expectedTotal;
-    int expectedStart;
+    int slotOffset, slotCount;  // -1: no cut
+    int expectedTotal, expectedStart;
 };
 
 class WaveformLength : public ::testing::TestWithParam<LengthCase> {};
@@ -52,25 +47,19 @@ TEST_P(WaveformLength, FollowsFramesSubframesAndSlots) {
 // offset before it counts slot 0 as a long slot only (30704).
 INSTANTIATE_TEST_SUITE_P(
     Cases, WaveformLength,
-    ::testing::Values(LengthCase{"OneFrame", 122.88e6, 1, 0, 10, Numerology::SCS30k, -1, -1, 1228800, 0},
-                      LengthCase{"ThreeFrames", 30.72e6, 3, 0, 10, Numerology::SCS15k, -1, -1, 921600, 0},
-                      LengthCase{"SubframesWithOffset", 30.72e6, 1, 2, 3, Numerology::SCS15k, -1, -1, 92160, 61440},
-                      LengthCase{"CutSecondSlot30k", 122.88e6, 1, 0, 10, Numerology::SCS30k, 1, 1, 61440, 61440},
-                      LengthCase{"CutTwoSlots15k", 30.72e6, 1, 0, 10, Numerology::SCS15k, 1, 2, 61440, 30704},
-                      LengthCase{"CutAfterSubframeOffset60k", 122.88e6, 1, 1, 10, Numerology::SCS60kNCP, 1, 2,
-                                 // 60 kHz: fft 2048, cp 144, long cp 208; slot 30688, slots 0 and 2 long
-                                 30752 + 30688, 122880 + 30752},
-                      LengthCase{"CutExtendedPrefix", 122.88e6, 1, 0, 10, Numerology::SCS60kECP, 0, 1,
-                                 // extended prefix 512: 12 x (2048 + 512), long cp = cp
-                                 30720, 0}),
+    ::testing::Values(
+        LengthCase{"OneFrame", 122.88e6, 1, 0, 10, Numerology::SCS30k, -1, -1, 1228800, 0},
+        LengthCase{"SubframesWithOffset", 30.72e6, 1, 2, 3, Numerology::SCS15k, -1, -1, 92160,
+                   61440},
+        LengthCase{"CutSecondSlot30k", 122.88e6, 1, 0, 10, Numerology::SCS30k, 1, 1, 61440, 61440},
+        LengthCase{"CutTwoSlots15k", 30.72e6, 1, 0, 10, Numerology::SCS15k, 1, 2, 61440, 30704},
+        LengthCase{"CutAfterSubframeOffset60k", 122.88e6, 1, 1, 10, Numerology::SCS60kNCP, 1, 2,
+                   // 60 kHz: fft 2048, cp 144, long cp 208; slot 30688, slots 0 and 2 long
+                   30752 + 30688, 122880 + 30752},
+        LengthCase{"CutExtendedPrefix", 122.88e6, 1, 0, 10, Numerology::SCS60kECP, 0, 1,
+                   // extended prefix 512: 12 x (2048 + 512), long cp = cp
+                   30720, 0}),
     [](const auto& info) { return std::string(info.param.name); });
-
-TEST(WaveformLength, NoCutWithoutCarriers) {
-    NR5GWaveformSettings settings;
-    settings.SampleRateAuto->setValue(7.68e6);
-    settings.NumberOfSlotsInSubframe->setValue(1);
-    EXPECT_EQ(ComputeWaveformLength(settings).totalSamples, 76800);
-}
 
 TEST(WaveformLength, UnusableSampleRateIsReported) {
     NR5GWaveformSettings settings;  // SampleRateAuto 0 by default
@@ -78,14 +67,6 @@ TEST(WaveformLength, UnusableSampleRateIsReported) {
     settings.SampleRateAuto->setValue(1e9);
     settings.NumberOfFrames->setValue(1000);  // far beyond an int of samples
     EXPECT_THROW(ComputeWaveformLength(settings), Orvalis_NR::EngineFailure);
-}
-
-TEST(AntennaFileName, SplitsBeforeTheLastFourCharacters) {
-    using Orvalis_NR::AntennaFileName;
-    EXPECT_EQ(AntennaFileName("wave.bin", 0, 1), "wave.bin");
-    EXPECT_EQ(AntennaFileName("wave.bin", 0, 2), "wave0.bin");
-    EXPECT_EQ(AntennaFileName("wave.bin", 1, 2), "wave1.bin");
-    EXPECT_EQ(AntennaFileName("out/a.iq", 11, 12), "out/11a.iq");  // the split ignores the dot
 }
 
 }  // namespace

@@ -2,11 +2,11 @@
 
 #include <gtest/gtest.h>
 
-#include <filesystem>
 #include <fstream>
 #include <string>
 #include <vector>
 
+#include "../engine/output_files.h"
 #include "payload/pn.h"
 
 namespace {
@@ -42,20 +42,45 @@ std::vector<char> draw(DataSourceBlock& source, int count) {
     return bits;
 }
 
-TEST(DataSource, Pn9BlockWrapsAfter511Bits) {
+struct PnCase {
+    PayloadDataType type;
+    int degree, tap, length;
+};
+
+class PnPayload : public ::testing::TestWithParam<PnCase> {};
+
+// Successive draws follow the register; the short periods are drawn in full and then across
+// their end, which must continue with the register's next period. Degrees 15 and up are sent
+// complemented, except PN31 draws shorter than the degree (the generator's short path).
+TEST_P(PnPayload, FollowsTheRegisterAcrossCallsWrapsAndRestartsOnReset) {
+    const PnCase& c = GetParam();
+    const bool inverted = c.degree >= 15;
     DataSourceBlock source;
-    source.Init(payload(PayloadDataType::PN9));
-    ASSERT_EQ(source.length, 511);
-    EXPECT_FALSE(source.generating);
-    EXPECT_EQ(source.block, registerBits(9, 5, 511, false));
-    const std::vector<char> first = draw(source, 500);
-    EXPECT_EQ(source.position, 500);
-    const std::vector<char> next = draw(source, 12);  // crosses the end: case 3
-    EXPECT_EQ(source.position, 1);
-    EXPECT_EQ(next[11], first[0]);  // the 512th bit equals the first
-    EXPECT_EQ(std::vector<char>(next.begin(), next.begin() + 11),
-              std::vector<char>(source.block.begin() + 500, source.block.end()));
+    source.Init(payload(c.type));
+    ASSERT_EQ(source.length, c.length);
+    const bool wraps = c.length < 40000;
+    const std::vector<int> calls =
+        wraps ? std::vector<int>{100, c.length - 105, 12} : std::vector<int>{100, 4900};
+    std::vector<char> got;
+    for (int count : calls) {
+        const std::vector<char> bits = draw(source, count);
+        got.insert(got.end(), bits.begin(), bits.end());
+    }
+    const std::vector<char> expected =
+        registerBits(c.degree, c.tap, wraps ? c.length + 7 : 5000, inverted);
+    EXPECT_EQ(got, expected);
+    source.Reset();
+    EXPECT_EQ(draw(source, 100), std::vector<char>(expected.begin(), expected.begin() + 100));
+    source.Reset();
+    EXPECT_EQ(draw(source, 8),
+              registerBits(c.degree, c.tap, 8, inverted && c.type != PayloadDataType::PN31));
 }
+
+INSTANTIATE_TEST_SUITE_P(Types, PnPayload,
+                         ::testing::Values(PnCase{PayloadDataType::PN9, 9, 5, 511},
+                                           PnCase{PayloadDataType::PN15, 15, 14, 32767},
+                                           PnCase{PayloadDataType::PN23, 23, 18, 0x7fffff},
+                                           PnCase{PayloadDataType::PN31, 31, 28, 0x7fffffff}));
 
 TEST(DataSource, RequestsOfTheBlockLengthAndLongerGoBitByBit) {
     DataSourceBlock source;
@@ -64,53 +89,8 @@ TEST(DataSource, RequestsOfTheBlockLengthAndLongerGoBitByBit) {
     EXPECT_EQ(draw(source, 5), (std::vector<char>{0, 1, 1, 1, 0}));
     EXPECT_EQ(source.position, 2);  // exactly the length: position unchanged
     EXPECT_EQ(draw(source, 12), (std::vector<char>{0, 1, 1, 1, 0, 0, 1, 1, 1, 0, 0, 1}));
-    EXPECT_EQ(source.position, 4);
-    EXPECT_EQ(draw(source, 0), std::vector<char>{});
     source.Reset();
     EXPECT_EQ(draw(source, 3), (std::vector<char>{1, 0, 0}));
-}
-
-TEST(DataSource, IntFormSignExtendsAndBothFormsAgree) {
-    DataSourceBlock chars, ints;
-    chars.Init(payload(PayloadDataType::Pattern, "01/1"));  // '/' - '0' is -1, kept unchecked
-    ints.Init(payload(PayloadDataType::Pattern, "01/1"));
-    std::vector<int> out(10, 7);
-    ints.GetOneFrame(out, 9);
-    const std::vector<char> c = draw(chars, 9);
-    for (int i = 0; i < 9; ++i)
-        EXPECT_EQ(out[static_cast<std::size_t>(i)],
-                  static_cast<int>(c[static_cast<std::size_t>(i)]));
-    EXPECT_EQ(out[2], -1);
-    EXPECT_EQ(out[9], 7);  // past count: untouched
-}
-
-TEST(DataSource, StoredPn15AndPn23) {
-    DataSourceBlock pn15, pn23;
-    pn15.Init(payload(PayloadDataType::PN15));
-    pn23.Init(payload(PayloadDataType::PN23));
-    EXPECT_EQ(pn15.length, 32767);
-    EXPECT_EQ(pn23.length, 0x7fffff);
-    EXPECT_EQ(pn15.block, registerBits(15, 14, 32767, true));
-    const std::vector<char> head = registerBits(23, 18, 5000, true);
-    EXPECT_TRUE(std::equal(head.begin(), head.end(), pn23.block.begin()));
-}
-
-TEST(DataSource, Pn31GeneratesAndRestartsOnReset) {
-    DataSourceBlock source;
-    source.Init(payload(PayloadDataType::PN31));
-    EXPECT_TRUE(source.generating);
-    EXPECT_EQ(source.length, 0x7fffffff);
-    EXPECT_TRUE(source.block.empty());
-    const std::vector<char> expected = registerBits(31, 28, 300, true);
-    std::vector<char> got = draw(source, 100);
-    const std::vector<char> more = draw(source, 200);
-    got.insert(got.end(), more.begin(), more.end());
-    EXPECT_EQ(got, expected);
-    source.Reset();
-    EXPECT_EQ(draw(source, 100), std::vector<char>(expected.begin(), expected.begin() + 100));
-    source.Reset();
-    // Fewer bits than the degree: the generator's short path, not complemented.
-    EXPECT_EQ(draw(source, 10), registerBits(31, 28, 10, false));
 }
 
 TEST(DataSource, Pn23PatternCutsPiecesOutOfTheSequence) {
@@ -128,39 +108,11 @@ TEST(DataSource, Pn23PatternCutsPiecesOutOfTheSequence) {
     expected.push_back(pn23[3]);
     EXPECT_EQ(source.block, expected);
 
-    source.Init(payload(PayloadDataType::Pattern, "PN23(17)"));
-    EXPECT_TRUE(source.block.empty());
-    EXPECT_THROW(draw(source, 4), std::invalid_argument);  // empty block
-    EXPECT_THROW(source.Init(payload(PayloadDataType::Pattern, "PN23(,5)")), std::invalid_argument);
     EXPECT_THROW(source.Init(payload(PayloadDataType::Pattern, "PN23(99999999999:1)")),
                  std::invalid_argument);  // index beyond int: refused with the pattern named
 }
 
-class UserFileTest : public ::testing::Test {
-  protected:
-    std::filesystem::path dir_;
-    void SetUp() override {
-        dir_ = std::filesystem::temp_directory_path() /
-               ("nrsynth_payload_" +
-                std::to_string(::testing::UnitTest::GetInstance()->random_seed()) + "_" +
-                ::testing::UnitTest::GetInstance()->current_test_info()->name());
-        std::filesystem::create_directories(dir_);
-    }
-    void TearDown() override { std::filesystem::remove_all(dir_); }
-    std::string write(const std::string& name, const std::string& content) {
-        const auto path = dir_ / name;
-        std::ofstream(path, std::ios::binary) << content;
-        return path.string();
-    }
-    std::vector<char> load(const std::string& path) {
-        DataSourceBlock source;
-        source.Init(payload(PayloadDataType::UserFile, "", path));
-        EXPECT_EQ(source.length, static_cast<int>(source.block.size()));
-        return source.block;
-    }
-};
-
-TEST_F(UserFileTest, TextAndBinaryForms) {
+TEST(DataSource, UserFilesInTextAndBinaryForms) {
     struct Case {
         const char* name;
         std::string content;
@@ -175,28 +127,23 @@ TEST_F(UserFileTest, TextAndBinaryForms) {
         {"data.bin", std::string("\xA5\x01", 2), {1, 0, 1, 0, 0, 1, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1}},
         {"upper.TXT", "X", {0, 1, 0, 1, 1, 0, 0, 0}},  // only ".txt" and ".csv" are text
     };
-    for (const auto& c : cases) EXPECT_EQ(load(write(c.name, c.content)), c.bits) << c.name;
-}
+    nrsynth_test::ScratchFolder folder;
+    for (const auto& c : cases) {
+        std::ofstream(folder.file(c.name), std::ios::binary) << c.content;
+        DataSourceBlock source;
+        source.Init(payload(PayloadDataType::UserFile, "", folder.file(c.name)));
+        EXPECT_EQ(source.block, c.bits) << c.name;
+        EXPECT_EQ(source.length, static_cast<int>(c.bits.size())) << c.name;
+    }
 
-TEST_F(UserFileTest, MissingFileIsAFailureNamingIt) {
-    const std::string missing = (dir_ / "absent.txt").string();
+    // A file that cannot be opened is a failure naming it.
+    const std::string missing = folder.file("absent.txt");
     try {
-        load(missing);
+        DataSourceBlock().Init(payload(PayloadDataType::UserFile, "", missing));
         FAIL() << "no exception";
     } catch (const std::runtime_error& e) {
         EXPECT_NE(std::string(e.what()).find(missing), std::string::npos) << e.what();
     }
-    EXPECT_THROW(load(dir_.string()), std::runtime_error);  // a folder is no file either
-}
-
-TEST(DataSource, RequestsBeyondTheCallersVector) {
-    DataSourceBlock source;
-    source.Init(payload(PayloadDataType::PN9));
-    std::vector<char> small(4);
-    EXPECT_THROW(source.GetOneFrame(small, 5), std::out_of_range);
-    EXPECT_THROW(source.GetOneFrame(small, -1), std::out_of_range);
-    source.position = 600;
-    EXPECT_THROW(source.GetOneFrame(small, 2), std::out_of_range);
 }
 
 }  // namespace
