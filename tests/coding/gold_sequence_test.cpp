@@ -25,22 +25,17 @@ BitSequence referenceGold(long long cInit, long long offset, int n) {
     return c;
 }
 
-TEST(GoldSequence, MatchesRegisterReferenceForManyInitialisations) {
+// Edge initialisations, then random ones with offsets from -1600 (the first register output)
+// to well past the start; lengths around the 28-bit word boundaries.
+TEST(GoldSequence, MatchesRegisterReference) {
     std::mt19937 rng(2024u);
-    std::vector<int> inits{0, 1, 2, 0x7FFFFFFF, 0x40000000, static_cast<int>(0x92345678u)};
-    for (int i = 0; i < 40; ++i) inits.push_back(static_cast<int>(rng() & 0x7FFFFFFFu));
-    for (int cInit : inits) {
-        for (int n : {1, 27, 28, 29, 55, 56, 57, 200, 1001}) {
+    for (int cInit : {0, 1, 0x7FFFFFFF, static_cast<int>(0x92345678u)}) {
+        for (int n : {1, 27, 28, 29, 56, 57, 1001}) {
             BitSequence c(static_cast<std::size_t>(n), 9);
             PN_Generator(c, n, cInit);
             ASSERT_EQ(c, referenceGold(cInit, 0, n)) << "cInit=" << cInit << " n=" << n;
         }
     }
-}
-
-// Offsets from -1600 (the first register output) to well past the start.
-TEST(GoldSequence, OffsetFormMatchesReference) {
-    std::mt19937 rng(7u);
     for (int trial = 0; trial < 40; ++trial) {
         const int cInit = static_cast<int>(rng() & 0x7FFFFFFFu);
         const int offset = trial == 0 ? -1600 : static_cast<int>(rng() % 6600) - 1600;

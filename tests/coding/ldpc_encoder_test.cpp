@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <bit>
 #include <climits>
 #include <iterator>
 #include <random>
@@ -24,34 +26,21 @@ const nlohmann::json& jsonBaseGraph(int bg) {
     return bg == 0 ? bg1 : bg2;
 }
 
-// Index of the lifting set (iLS) holding z, from TS 38.212 Table 5.3.2-1 (a * 2^j).
-int liftingSetOf(int z) {
-    const int a[8] = {2, 3, 5, 7, 9, 11, 13, 15};
-    for (int s = 0; s < 8; ++s)
-        for (int v = a[s]; v <= 384; v *= 2)
-            if (v == z) return s;
-    return -1;
-}
-
-// Number of unsatisfied lifted parity checks of a full code word (68 Z or 52 Z bits).
-int failedChecks(int bg, int z, const std::vector<int>& word) {
-    const int set = liftingSetOf(z);
+// Number of unsatisfied lifted parity checks of the code word made of the encoder input
+// (fillers read as 0) and its d sequence output.
+int failedChecks(int bg, int z, const std::vector<int>& in, const std::vector<int>& d) {
+    std::vector<int> word(d.size() + 2 * static_cast<std::size_t>(z), 0);
+    for (std::size_t i = 0; i < in.size(); ++i) word[i] = in[i] == -2 ? 0 : in[i];
+    for (std::size_t i = in.size() - 2 * z; i < d.size(); ++i) word[i + 2 * z] = d[i];
+    // Z = a 2^j of TS 38.212 Table 5.3.2-1, a in {2, 3, 5, .., 15}: set (a' - 1) / 2 with a'
+    // the odd part of Z.
+    const int set = ((z >> std::countr_zero(static_cast<unsigned>(z))) - 1) / 2;
     std::vector<int> sums(static_cast<std::size_t>((bg == 0 ? 46 : 42) * z), 0);
     for (const auto& e : jsonBaseGraph(bg)) {
         const int row = e.at(0), column = e.at(1), shift = e.at(2 + set).get<int>() % z;
         for (int r = 0; r < z; ++r) sums[row * z + r] ^= word[column * z + (shift + r) % z] & 1;
     }
-    int failed = 0;
-    for (int s : sums) failed += s;
-    return failed;
-}
-
-// The full code word from an encoder input (fillers read as 0) and its d sequence output.
-std::vector<int> fullCodeWord(const std::vector<int>& in, const std::vector<int>& d, int z) {
-    std::vector<int> word(d.size() + 2 * static_cast<std::size_t>(z), 0);
-    for (std::size_t i = 0; i < in.size(); ++i) word[i] = in[i] == -2 ? 0 : in[i];
-    for (std::size_t i = in.size() - 2 * z; i < d.size(); ++i) word[i + 2 * z] = d[i];
-    return word;
+    return static_cast<int>(std::count(sums.begin(), sums.end(), 1));
 }
 
 std::vector<LdpcKernel> availableKernels() {
@@ -70,16 +59,15 @@ struct GeometryCase {
     int z;
 };
 
-// Per lifting set the smallest, a middle and the largest size, for both graphs.
+// Per lifting set the smallest and the largest size, for both graphs.
 std::vector<GeometryCase> geometryCases() {
     std::vector<GeometryCase> cases;
     for (int bg = 0; bg < 2; ++bg) {
         for (int a : {2, 3, 5, 7, 9, 11, 13, 15}) {
-            std::vector<int> sizes;
-            for (int z = a; z <= 384; z *= 2) sizes.push_back(z);
-            for (int z : {sizes.front(), sizes[sizes.size() / 2], sizes.back()})
-                if (cases.empty() || cases.back().z != z || cases.back().baseGraph != bg)
-                    cases.push_back({bg, z});
+            int z = a;
+            while (2 * z <= 384) z *= 2;
+            cases.push_back({bg, a});
+            cases.push_back({bg, z});
         }
     }
     return cases;
@@ -105,7 +93,7 @@ TEST_P(LdpcGeometry, CodeWordsSatisfyAllParityChecksInEveryKernel) {
             auto in = info;
             std::vector<int> out(static_cast<std::size_t>(encoder.N), 7);
             ASSERT_TRUE(encoder.RunWith(kernel, in, out));
-            EXPECT_EQ(failedChecks(bg, z, fullCodeWord(info, out, z)), 0);
+            EXPECT_EQ(failedChecks(bg, z, info, out), 0);
             for (int i = 2 * z; i < encoder.K; ++i) {
                 ASSERT_EQ(out[i - 2 * z], info[i]) << "systematic bit " << i;
                 ASSERT_EQ(in[i], info[i] == -2 ? 0 : info[i]) << "input bit " << i;
@@ -126,15 +114,10 @@ TEST(LdpcEncoder, RefusesUnknownGraphsSizesAndLiftings) {
     LDPC_Encoder encoder;
     EXPECT_FALSE(encoder.Initialize(2, 2));
     EXPECT_THROW(encoder.Initialize(0, 17), std::invalid_argument);
-
     ASSERT_TRUE(encoder.Initialize(0, 4));
-    std::vector<int> in(static_cast<std::size_t>(encoder.K + 1), 1);
-    std::vector<int> out(static_cast<std::size_t>(encoder.N), 9);
+    std::vector<int> in(static_cast<std::size_t>(encoder.K + 1), 1), out(encoder.N, 9);
     EXPECT_FALSE(encoder.Run(in, out));
     EXPECT_EQ(out, std::vector<int>(static_cast<std::size_t>(encoder.N), 9));
-    in.resize(static_cast<std::size_t>(encoder.K));
-    out.resize(static_cast<std::size_t>(encoder.N - 1));
-    EXPECT_FALSE(encoder.Run(in, out));
 }
 
 // Inputs outside 0/1/-2, or fillers where the systematic bits are never sent, are not
@@ -177,11 +160,10 @@ TEST_P(LdpcVectorFile, EncoderReproducesTheReference) {
     NRSYNTH_REQUIRE_SHARED();
     const std::string name = GetParam();
     const auto cases = readVectorCases("ldpc/" + name + ".txt", [](const auto&) { return 2; });
-    if (cases.empty()) GTEST_SKIP() << "vector file absent";
+    ASSERT_FALSE(cases.empty());
     const int bg = name.find("bg1") != std::string::npos ? 0 : 1;
     LDPC_Encoder encoder;
     for (const auto& c : cases) {
-        ASSERT_EQ(c.lines.size(), 2u);
         const int z = std::stoi(c.header.at(0));
         ASSERT_TRUE(z == encoder.Z || encoder.Initialize(bg, z)) << "Z " << z;
         auto in = bitsOf<int>(c.lines[0]);

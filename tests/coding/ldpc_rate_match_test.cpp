@@ -83,12 +83,8 @@ TEST(LdpcRateMatch, Refusals) {
     ASSERT_TRUE(rm.Initialize(LDPC_BG2, 2, 1, 100, 100, 10, 0, 2));
     std::vector<int> d(99, 1), f(10, 0);
     EXPECT_FALSE(rm.Run(d, f));
-    d.resize(100);
-    f.resize(11);
-    EXPECT_FALSE(rm.Run(d, f));
     // A buffer of fillers is reported instead of looping forever; so is Ncb above N.
     d.assign(100, -2);
-    f.resize(10);
     EXPECT_THROW(rm.Run(d, f), std::invalid_argument);
     ASSERT_TRUE(rm.Initialize(LDPC_BG2, 2, 1, 120, 100, 10, 0, 2));
     d.assign(100, 1);
@@ -99,7 +95,7 @@ TEST(LdpcRateMatch, PublishedSelectionAndInterleavingVectors) {
     NRSYNTH_REQUIRE_SHARED();
     const auto cases =
         readVectorCases("ldpc_ratematch/py5gphy_ldpc_ratematch.txt", [](auto&) { return 2; });
-    if (cases.empty()) GTEST_SKIP() << "vector file absent";
+    ASSERT_FALSE(cases.empty());
     for (const auto& c : cases) {
         const int ncb = std::stoi(c.header.at(0));
         const int e = std::stoi(c.header.at(1));

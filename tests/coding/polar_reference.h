@@ -1,15 +1,12 @@
 #pragma once
-// Plain reference forms of the polar chain of TS 38.212 (clauses 5.3.1, 5.4.1), written
-// straight from the clause text and reading the tables from the project's JSON data, not from
-// the generated header. The tests compare the library against these.
+// Plain reference forms of the polar chain of TS 38.212 (clauses 5.3.1, 5.4.1), read from the
+// clause text with the tables of data/3gpp rather than the generated header.
 
 #include <algorithm>
 #include <bit>
 #include <cmath>
-#include <random>
 #include <set>
 #include <stdexcept>
-#include <string>
 #include <vector>
 
 #include "vector_file.h"
@@ -59,20 +56,15 @@ inline Selection selection(int K, int E, int N) {
 
 struct Sets {
     int N = 0;
-    std::vector<int> info;  // Q_I, ascending reliability
-    std::set<int> frozen;   // Q_F without the rate-matching pre-frozen positions
-    std::set<int> preFrozen;
-    std::set<int> parity;  // Q_PC
+    std::vector<int> info;            // Q_I, ascending reliability
+    std::set<int> frozen, preFrozen;  // Q_F apart from the rate-matching ones, and those
+    std::set<int> parity;             // Q_PC
 };
 
 /// Clause 5.3.1.2 with the Q_F,tmp of clause 5.4.1.1.
 inline Sets sets(int K, int E, int nMax, int nPC, int nPCwm) {
     Sets s;
     const int N = s.N = codeLength(K, E, nMax);
-    std::vector<int> Q;
-    for (int q : polarSequence())
-        if (q < N) Q.push_back(q);
-
     if (E < N) {
         if (selection(K, E, N) == Selection::Puncturing) {
             for (int n = 0; n <= N - E - 1; ++n) s.preFrozen.insert(subBlockJ(n, N));
@@ -84,8 +76,8 @@ inline Sets sets(int K, int E, int nMax, int nPC, int nPCwm) {
         }
     }
     std::vector<int> remaining;
-    for (int q : Q)
-        if (!s.preFrozen.count(q)) remaining.push_back(q);
+    for (int q : polarSequence())
+        if (q < N && !s.preFrozen.count(q)) remaining.push_back(q);
     const int count = K + nPC;
     if (count > static_cast<int>(remaining.size())) throw std::invalid_argument("too many bits");
     s.info.assign(remaining.end() - count, remaining.end());
@@ -118,17 +110,12 @@ inline Bits encoderInput(const Bits& c, int E, int nMax, int iIL, int nPC, int n
     const std::set<int> info(s.info.begin(), s.info.end());
     Bits u(static_cast<std::size_t>(s.N), 0);
     int k = 0;
-    char y0 = 0, y1 = 0, y2 = 0, y3 = 0, y4 = 0;
+    Bits y(5, 0);  // the cyclic parity register y0..y4
     for (int n = 0; n < s.N; ++n) {
-        const char yCyc = y0;
-        y0 = y1, y1 = y2, y2 = y3, y3 = y4, y4 = yCyc;
+        std::rotate(y.begin(), y.begin() + 1, y.end());
         if (!info.count(n)) continue;
-        if (s.parity.count(n)) {
-            u[n] = y0;
-        } else {
-            u[n] = cPrime[k++];
-            y0 = static_cast<char>(y0 ^ u[n]);
-        }
+        u[n] = s.parity.count(n) ? y[0] : cPrime[k++];
+        if (!s.parity.count(n)) y[0] = static_cast<char>(y[0] ^ u[n]);
     }
     return u;
 }

@@ -83,6 +83,17 @@ struct Placement {
     }
 };
 
+// TS 38.211 Table 7.4.3.1-1 written out: the content of symbol l, subcarrier k, of an SS/PBCH
+// block for v = cellId mod 4, as its occupancy value (PSS 380, SSS 390, unused 370, PBCH data
+// 400, DM-RS 410).
+int expectedOccupancy(int l, int k, int v) {
+    const bool sync = k >= 56 && k <= 182, dmrsComb = (k - v) % 4 == 0 && k >= v;
+    if (l == 0) return sync ? 380 : 370;
+    if (l == 2 && sync) return 390;
+    if (l == 2 && ((k >= 48 && k <= 55) || (k >= 183 && k <= 191))) return 370;
+    return dmrsComb ? 410 : 400;
+}
+
 class PbchRoundTrip : public ::testing::TestWithParam<RoundTripCase> {};
 
 TEST_P(PbchRoundTrip, EveryMappedBlockDecodesToItsMibAndTimingBits) {
@@ -134,13 +145,16 @@ TEST_P(PbchRoundTrip, EveryMappedBlockDecodesToItsMibAndTimingBits) {
         const int hrf =
             c.period == Models::Nr5g::SSBPeriod::HalfFrame ? (i >= c.lmax ? 1 : 0) : c.halfFrame;
 
-        // Resource elements of the block, in the order of TS 38.211 clause 7.4.3.1.3.
+        // Every element of the block holds the content of the table; PBCH data and DM-RS are
+        // read in the order of TS 38.211 clause 7.4.3.1.3.
         std::vector<complex> data, dmrs;
-        for (int l = 1; l < 4; ++l)
+        for (int l = 0; l < 4; ++l)
             for (int k = 0; k < 240; ++k) {
                 const std::size_t at = store.at(p + l, c.frequencyOffset - 120 + k);
-                if (store.occupancy[0][at] == 400) data.push_back(store.grid[0][at]);
-                if (store.occupancy[0][at] == 410) dmrs.push_back(store.grid[0][at]);
+                const int occupancy = store.occupancy[0][at];
+                ASSERT_EQ(occupancy, expectedOccupancy(l, k, c.cellId % 4)) << l << ", " << k;
+                if (occupancy == 400) data.push_back(store.grid[0][at]);
+                if (occupancy == 410) dmrs.push_back(store.grid[0][at]);
             }
         ASSERT_EQ(data.size(), 432u);
         ASSERT_EQ(dmrs.size(), 144u);

@@ -94,21 +94,6 @@ INSTANTIATE_TEST_SUITE_P(Cases, FilterAgainstConvolution,
                                     std::get<1>(info.param).name;
                          });
 
-TEST(Fir, RebuildsItsSpectrumWhenTheTransformIsResized) {
-    const Samples coefficients = randomSamples(9, 5);
-    const Samples input = randomSamples(120, 6);
-    const Samples expected = directConvolution(coefficients, input);
-    auto transform = std::make_shared<IppDft>(16);
-    Fir fir(transform, coefficients);
-    Samples output(120);
-    fir.filter(input.data(), 8, output.data(), 8);
-    transform->resize(100);  // not a power of two: the general transform takes over
-    fir.filter(input.data() + 8, 92, output.data() + 8, 92);
-    transform->resize(64);
-    fir.filter(input.data() + 100, 20, output.data() + 100, 20);
-    EXPECT_LE(maxAbsDifference(output, expected), tolerance(expected));
-}
-
 // One case per check a caller can run into.
 TEST(FilterFailures, AreInvalidArguments) {
     Samples x(20), y(20);

@@ -26,15 +26,13 @@ double gainAt(const std::vector<double>& h, double f) {
     return std::abs(sum);
 }
 
-// Linear phase: symmetric about (taps - 1) / 2, for odd and even lengths.
-TEST(SincLowPass, SymmetricAboutItsCentre) {
+// Linear phase: symmetric about (taps - 1) / 2, for odd and even lengths; the energy is the
+// normalisation, windowed or not.
+TEST(SincLowPass, SymmetricWithTheEnergyOfTheNormalisation) {
     for (int taps : {1024, 1025}) {
         const auto h = Generate_SincLowPass(0.3, taps, 1, taps % 2 == 1);
         for (int i = 0; i < taps / 2; ++i) EXPECT_NEAR(h[i], h[taps - 1 - i], 1e-15) << taps;
     }
-}
-
-TEST(SincLowPass, EnergyEqualsTheNormalisation) {
     for (int normalise : {1, 3, 4})
         for (bool window : {false, true})
             EXPECT_NEAR(energy(Generate_SincLowPass(0.21, 301, normalise, window)), normalise,

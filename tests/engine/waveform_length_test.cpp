@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include "engine/engine_failure.h"
 #include "engine/nr5g_engine.h"
 #include "models/nr5g_waveform_settings.h"
 
@@ -60,13 +59,5 @@ INSTANTIATE_TEST_SUITE_P(
                    // extended prefix 512: 12 x (2048 + 512), long cp = cp
                    30720, 0}),
     [](const auto& info) { return std::string(info.param.name); });
-
-TEST(WaveformLength, UnusableSampleRateIsReported) {
-    NR5GWaveformSettings settings;  // SampleRateAuto 0 by default
-    EXPECT_THROW(ComputeWaveformLength(settings), Orvalis_NR::EngineFailure);
-    settings.SampleRateAuto->setValue(1e9);
-    settings.NumberOfFrames->setValue(1000);  // far beyond an int of samples
-    EXPECT_THROW(ComputeWaveformLength(settings), Orvalis_NR::EngineFailure);
-}
 
 }  // namespace

@@ -1,5 +1,5 @@
 // Whole waveforms through the C interface: file lengths, names and contents of continuous-wave
-// carriers and noise, the cyclic seam, carrier accumulation and cancelling.
+// carriers, noise, the cyclic seam, carrier accumulation and cancelling.
 
 #include <gtest/gtest.h>
 
@@ -63,8 +63,7 @@ TEST_F(WaveformOutput, FrequencyOffsetPhaseAndGainContinueAcrossFramesAndTheLoop
     EXPECT_NEAR(std::arg(step), 2.0 * std::numbers::pi * 1000.0 / kRate, 1e-10);
 }
 
-// One file pair per antenna, numbered when there are several, at the continuous wave's level;
-// subframes keep their share of the frame.
+// One file pair per antenna, numbered when there are several, at the continuous wave's level.
 TEST_F(WaveformOutput, FileNamesAndLengths) {
     struct Case {
         nlohmann::json settings;
@@ -73,7 +72,6 @@ TEST_F(WaveformOutput, FileNamesAndLengths) {
     };
     const Case cases[] = {
         {nlohmann::json::object(), {"wave.bin"}, kFrame},
-        {{{"SubframeOffset", 2}, {"NumberOfSubframes", 3}}, {"wave.bin"}, 3 * 30720},
         {{{"NumberOfAntennas", 2}}, {"wave0.bin", "wave1.bin"}, kFrame},
     };
     for (const auto& c : cases) {

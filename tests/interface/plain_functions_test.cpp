@@ -135,6 +135,7 @@ TEST_F(PlainFunctions, ValuesThatWouldBreakTheEngineAreReportedNotCrashed) {
                             R"( "PowerLevelStr": "1")";
     const std::string documents[] = {
         R"({"SampleRateAuto": 0})",
+        R"({"SampleRateAuto": 1e9, "NumberOfFrames": 1000})",  // beyond an int of samples
         R"({"SampleRateAuto": 3.84e6, "NumberOfAntennas": -2})",
         R"({"SampleRateAuto": 3e9, "AwgnEnabled": true})",
         head + R"("CellID": 5000, )" + ssb + "}}}]}",
