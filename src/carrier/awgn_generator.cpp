@@ -7,7 +7,7 @@
 
 #include "dsp/filter.h"
 #include "dsp/sinc_low_pass.h"
-#include "engine/engine_failure.h"
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 

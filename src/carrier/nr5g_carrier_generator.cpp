@@ -5,7 +5,7 @@
 #include <numbers>
 #include <numeric>
 
-#include "engine/engine_failure.h"
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 

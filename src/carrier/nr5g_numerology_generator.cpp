@@ -6,8 +6,8 @@
 
 #include "downlink/pbch_generator.h"
 #include "dsp/sinc_low_pass.h"
-#include "engine/engine_failure.h"
-#include "engine/log.h"
+#include "common/failure.h"
+#include "common/log.h"
 
 namespace Orvalis_NR {
 

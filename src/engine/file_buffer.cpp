@@ -4,7 +4,7 @@
 #include <cstring>
 #include <utility>
 
-#include "engine/engine_failure.h"
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 

@@ -21,7 +21,7 @@ public:
     FileBuffer& operator=(FileBuffer&& other) noexcept;
     ~FileBuffer();
 
-    /// Opens (creates, empties) `path` and `path` + ".mkr". Throws EngineFailure
+    /// Opens (creates, empties) `path` and `path` + ".mkr". Throws the library failure text
     /// "FileBuffer::Open file failed." naming the file.
     void Init(const char* path);
     /// Back to the start of both files.

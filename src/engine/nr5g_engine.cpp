@@ -6,7 +6,7 @@
 #include "carrier/awgn_generator.h"
 #include "carrier/nr5g_carrier_generator.h"
 #include "coding/table_edition.h"
-#include "engine/engine_failure.h"
+#include "common/failure.h"
 #include "framework/tools.h"
 
 namespace Orvalis_NR {

@@ -11,7 +11,7 @@
 #include <vector>
 
 #include "engine/file_buffer.h"
-#include "engine/log.h"
+#include "common/log.h"
 #include "models/nr5g_waveform_settings.h"
 
 namespace Orvalis_NR {

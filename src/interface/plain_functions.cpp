@@ -5,7 +5,7 @@
 #include <memory>
 #include <string>
 
-#include "engine/engine_failure.h"
+#include "common/failure.h"
 #include "engine/nr5g_engine.h"
 #include "framework/json_serializer.h"
 #include "interface/log_buffer.h"
