@@ -1,5 +1,6 @@
 #include "json_serializer.h"
 
+#include <algorithm>
 #include <limits>
 #include <nlohmann/json.hpp>
 
@@ -15,10 +16,83 @@ using nlohmann::ordered_json;
 
 namespace {
 
+/// A bad value described by kind and size, never by a recursive dump: a scalar as its text
+/// (a long string cut short), a container by its element count.
 std::string kindOf(const json& value) {
-    std::string text = value.dump();
-    if (text.size() > 60) text = text.substr(0, 57) + "...";
-    return text;
+    const auto count = [](std::size_t n, const char* one, const char* many) {
+        return std::to_string(n) + " " + (n == 1 ? one : many);
+    };
+    switch (value.type()) {
+        case json::value_t::array:
+            return value.empty() ? "an empty array"
+                                 : "an array of " + count(value.size(), "element", "elements");
+        case json::value_t::object:
+            return value.empty() ? "an empty object"
+                                 : "an object with " + count(value.size(), "key", "keys");
+        case json::value_t::string: {
+            const auto& text = value.get_ref<const std::string&>();
+            if (text.size() <= 60)
+                return json(text).dump(-1, ' ', false, json::error_handler_t::replace);
+            return json(text.substr(0, 57)).dump(-1, ' ', false, json::error_handler_t::replace) +
+                   "... (" + std::to_string(text.size()) + " bytes)";
+        }
+        default:
+            return value.dump();
+    }
+}
+
+/// What a scan of the raw text tells before parsing: where it first nests deeper than the
+/// limit (npos when never), and a bound on its number of values (one per separator and
+/// container). Checked first, so that no stage, the parser included, sees such a document.
+struct TextShape {
+    std::size_t tooDeepAt = std::string::npos;
+    std::size_t values = 1;
+};
+
+TextShape scanShape(const std::string& text, int depthLimit) {
+    TextShape shape;
+    int depth = 0;
+    bool inString = false;
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const char c = text[i];
+        if (inString) {
+            if (c == '\\')
+                ++i;
+            else if (c == '"')
+                inString = false;
+        } else if (c == '"') {
+            inString = true;
+        } else if (c == '[' || c == '{') {
+            ++shape.values;
+            if (++depth > depthLimit) {
+                shape.tooDeepAt = i;
+                return shape;
+            }
+        } else if (c == ']' || c == '}') {
+            --depth;
+        } else if (c == ',') {
+            ++shape.values;
+        }
+    }
+    return shape;
+}
+
+/// Settings held by a model and everything below it.
+std::size_t countSettings(const IModel& model) {
+    std::size_t count = 0;
+    if (model.isCollection()) {
+        const auto& collection = static_cast<const ModelCollectionBase&>(model);
+        for (int i = 0; i < collection.getCount(); ++i)
+            if (auto item = collection.getCommonItem(i)) count += countSettings(*item);
+        return count;
+    }
+    if (const auto* base = dynamic_cast<const ModelBase*>(&model)) {
+        count += base->settings.size();
+        for (const auto& setting : base->settings)
+            if (setting->isSubSetting())
+                if (auto held = setting->getCommonValue()) count += countSettings(*held);
+    }
+    return count;
 }
 
 std::string child(const std::string& path, const std::string& key) {
@@ -34,7 +108,8 @@ std::string where(const std::string& path) {
 /// Walks a parsed document into a model tree.
 class JsonReader {
   public:
-    explicit JsonReader(JsonSerializer& owner) : owner_(owner) {}
+    JsonReader(JsonSerializer& owner, std::size_t settingsBudget)
+        : owner_(owner), settingsLeft_(settingsBudget) {}
 
     void fillModel(const json& value, IModel& model, const std::string& path) {
         if (model.isCollection()) {
@@ -87,6 +162,7 @@ class JsonReader {
                            ", got " + kindOf(*items));
             return;
         }
+        reserveItems(*items, collection, path);
         collection.clear();
         int index = 0;
         for (const auto& element : *items) {
@@ -175,6 +251,24 @@ class JsonReader {
         fail(path, "expected an enumerator name, display name or position, got " + kindOf(value));
     }
 
+    /// Refuses a collection whose items would make the tree unreasonably large, before any
+    /// of them is built: a default item alone may hold hundreds of settings.
+    void reserveItems(const json& items, ModelCollectionBase& collection, const std::string& path) {
+        const std::size_t count = items.size();
+        if (count > JsonSerializer::maxCollectionItems)
+            throw DeserializeError(where(path) + ": " + std::to_string(count) +
+                                   " items are more than a collection may hold (" +
+                                   std::to_string(JsonSerializer::maxCollectionItems) + ")");
+        const std::size_t perItem =
+            std::max<std::size_t>(1, countSettings(*collection.getItemPrototype()));
+        if (count > settingsLeft_ / perItem)
+            throw DeserializeError(where(path) + ": " + std::to_string(count) +
+                                   " items would take the document past " +
+                                   std::to_string(JsonSerializer::maxTreeSettings) +
+                                   " settings in all");
+        settingsLeft_ -= count * perItem;
+    }
+
     void fail(const std::string& path, const std::string& message) {
         const std::string text = where(path) + ": " + message;
         if (!owner_.collectIssues_) throw DeserializeError(text);
@@ -182,6 +276,7 @@ class JsonReader {
     }
 
     JsonSerializer& owner_;
+    std::size_t settingsLeft_;
 };
 
 std::shared_ptr<ModelBase> JsonSerializer::deserialize(const std::string& text) {
@@ -197,13 +292,29 @@ std::shared_ptr<ModelBase> JsonSerializer::deserialize(const std::string& text,
     auto root = std::dynamic_pointer_cast<ModelBase>(entry->prototype->create());
     if (!root) throw DeserializeError("root type " + rootType + " is not a model");
 
+    if (text.size() > maxDocumentBytes)
+        throw DeserializeError("document of " + std::to_string(text.size()) +
+                               " bytes is larger than " + std::to_string(maxDocumentBytes) +
+                               " bytes");
+    const TextShape shape = scanShape(text, maxNestingDepth);
+    if (shape.tooDeepAt != std::string::npos)
+        throw DeserializeError("document nests deeper than " + std::to_string(maxNestingDepth) +
+                               " levels (at byte " + std::to_string(shape.tooDeepAt) + ")");
+    if (shape.values > maxJsonValues)
+        throw DeserializeError("document holds " + std::to_string(shape.values) +
+                               " values, more than " + std::to_string(maxJsonValues));
+
     json document;
     try {
         document = json::parse(text);
     } catch (const json::exception& e) {
-        throw DeserializeError(std::string("malformed JSON: ") + e.what());
+        std::string reason = e.what();
+        if (reason.size() > 200) reason = reason.substr(0, 197) + "...";
+        throw DeserializeError("malformed JSON: " + reason);
     }
-    JsonReader(*this).fillModel(document, *root, "");
+    const std::size_t rootSettings = countSettings(*root);
+    JsonReader(*this, maxTreeSettings > rootSettings ? maxTreeSettings - rootSettings : 0)
+        .fillModel(document, *root, "");
     return root;
 }
 

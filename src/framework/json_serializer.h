@@ -6,6 +6,7 @@
 // may carry "$type", the full type name, which must then name the expected type. Omitted keys
 // keep their constructor defaults; unknown keys are ignored (and listed).
 
+#include <cstddef>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -25,6 +26,14 @@ class JsonSerializer {
   public:
     /// Full type name of the root model of a waveform document.
     static constexpr const char* defaultRootType = "Models.Nr5g.NR5GWaveformSettings";
+
+    /// Bounds of a readable document, generous for real waveforms; a document past one of
+    /// them is refused before its tree is built.
+    static constexpr std::size_t maxDocumentBytes = 64u << 20;
+    static constexpr int maxNestingDepth = 64;
+    static constexpr std::size_t maxJsonValues = 4'000'000;
+    static constexpr std::size_t maxCollectionItems = 4096;
+    static constexpr std::size_t maxTreeSettings = 500'000;
 
     JsonSerializer() = default;
 

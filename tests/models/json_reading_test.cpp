@@ -125,7 +125,7 @@ INSTANTIATE_TEST_SUITE_P(
         ErrorCase{R"({"NRCarriers": {"$values": 3}})",
                   "NRCarriers: expected an array of Models.Nr5g.NRCarrier, got 3"},
         ErrorCase{R"({"NRCarriers": {"items": []}})",
-                  R"(NRCarriers: expected an array or an object with "$values", got {"items":[]})"},
+                  R"(NRCarriers: expected an array or an object with "$values", got an object with 1 key)"},
         ErrorCase{
             R"({"NRCarriers": [{"$type": "Models.Nr5g.NRDCI"}]})",
             R"(NRCarriers[0]: $type "Models.Nr5g.NRDCI" is not the expected type Models.Nr5g.NRCarrier)"},
@@ -135,7 +135,7 @@ INSTANTIATE_TEST_SUITE_P(
             R"({"$type": "Models.Nr5g.NRCarrier"})",
             R"((root): $type "Models.Nr5g.NRCarrier" is not the expected type Models.Nr5g.NR5GWaveformSettings)"},
         ErrorCase{"[]",
-                  "(root): expected an object of type Models.Nr5g.NR5GWaveformSettings, got []"}));
+                  "(root): expected an object of type Models.Nr5g.NR5GWaveformSettings, got an empty array"}));
 
 TEST(JsonReading, MalformedTextIsAnError) {
     EXPECT_NE(errorOf(R"({"NumberOfFrames": )").find("malformed JSON"), std::string::npos);
