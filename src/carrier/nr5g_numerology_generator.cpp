@@ -5,6 +5,7 @@
 #include <string>
 
 #include "downlink/pbch_generator.h"
+#include "downlink/pdcch_generator.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
 #include "common/log.h"
@@ -35,6 +36,7 @@ bool isRealTime(PhaseCompensationMode mode) {
 
 NR5GNumerologyGenerator::~NR5GNumerologyGenerator() {
     for (auto* generator : pbchGenerators) delete generator;
+    for (auto* generator : pdcchGenerators) delete generator;
 }
 
 void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform, Models::Nr5g::NRCarrier& owner,
@@ -75,6 +77,8 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
 
     for (auto* generator : pbchGenerators) delete generator;
     pbchGenerators.clear();
+    for (auto* generator : pdcchGenerators) delete generator;
+    pdcchGenerators.clear();
     lowestSubcarrier = 360000;
     highestSubcarrier = 0;
     transformPrecoded = false;
@@ -120,6 +124,30 @@ void NR5GNumerologyGenerator::buildDownlinkChannels() {
             highestSubcarrier = std::max(first + generator->BlockWidth - 1, 0);
         }
     }
+
+    Log("Start Init PDCCH");
+    auto dcis = downlink->DCI->getValue();
+    for (int i = 0; i < dcis->getCount(); ++i) {
+        auto dci = dcis->getItem(i);
+        if (!dci->Enabled->getValue()) continue;
+        auto bwp = downlinkBwp(dci->BWPIndex->getValue(), "Downlink.DCI[" + std::to_string(i) + "]");
+        if (static_cast<int>(bwp->Numerology->getValue()) != numerology) continue;
+        auto* generator = new PDCCH_Generator();
+        pdcchGenerators.push_back(generator);
+        generator->Init(settings, carrier, dci.get(), bwp.get());
+        hasValidChannel = true;
+        int low = 0, high = 0;
+        generator->GetScAllocation(low, high);
+        lowestSubcarrier = std::min(low, lowestSubcarrier);
+        highestSubcarrier = std::max(high, highestSubcarrier);
+    }
+    Log("End Init PDCCH");
+}
+
+std::shared_ptr<Models::Nr5g::NRDLBWP> NR5GNumerologyGenerator::downlinkBwp(int index, const std::string& item) const {
+    auto bwp = carrier->Downlink->getValue()->BWP->getValue()->getItem(index);
+    if (!bwp) failWith("The channel names no bandwidth part.", item + ".BWPIndex " + std::to_string(index));
+    return bwp;
 }
 
 int NR5GNumerologyGenerator::filterGuard() const {
@@ -170,6 +198,7 @@ std::vector<int> NR5GNumerologyGenerator::countChannels() const {
     std::vector<int> counts(8, 0);
     for (const auto* generator : pbchGenerators)
         if (!generator->ReserveOnly) ++counts[static_cast<std::size_t>(channelOrder[PlacePBCH])];
+    counts[static_cast<std::size_t>(channelOrder[PlacePDCCH])] += static_cast<int>(pdcchGenerators.size());
     return counts;
 }
 
@@ -240,6 +269,7 @@ void NR5GNumerologyGenerator::MarkUnavailable() {
 
 void NR5GNumerologyGenerator::ResetDataSource() {
     for (auto* generator : pbchGenerators) if (generator->Source) generator->Source->Reset();
+    for (auto* generator : pdcchGenerators) if (generator->Source) generator->Source->Reset();
 }
 
 bool NR5GNumerologyGenerator::takeCancel() { return cancelRequested.exchange(0, std::memory_order_relaxed) != 0; }
@@ -313,6 +343,16 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
         if (takeCancel()) return;
     }
     if (!pbchGenerators.empty()) Log("End Generate PBCH");
+    if (takeCancel()) return;
+
+    if (!pdcchGenerators.empty()) Log("Start Generate PDCCH");
+    for (auto* generator : pdcchGenerators) {
+        if (static_cast<int>(generator->GetNumerology()) != numerology) continue;
+        const bool markAlc = isPrimary && pbchGenerators.empty();  // and no PDSCH generator
+        generator->Map(grid, occupancy, frame, symbolMarks, markAlc);
+        anyMapped = true;
+    }
+    if (!pdcchGenerators.empty()) Log("End Generate PDCCH");
     if (takeCancel()) return;
     if (!anyMapped) return;
 

@@ -6,6 +6,7 @@
 #include <atomic>
 #include <complex>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "dsp/filter.h"
@@ -16,6 +17,7 @@
 namespace Orvalis_NR {
 
 class PBCH_Generator;
+class PDCCH_Generator;
 
 /// Places of the channel kinds in a count vector.
 enum ChannelPlace { PlacePBCH, PlacePDSCH, PlacePDCCH, PlaceCSIRS, PlacePUSCH, PlacePUCCH, PlaceSRS, PlacePRS };
@@ -65,6 +67,7 @@ public:
     std::vector<int> channelCounts;
     int channelOrder[8] = {0, 1, 2, 3, 4, 5, 6, 7};
     std::vector<PBCH_Generator*> pbchGenerators;
+    std::vector<PDCCH_Generator*> pdcchGenerators;
     std::vector<std::shared_ptr<Filter>> filters;
     int sampleDelay = 0;
     std::atomic<char> cancelRequested{0};
@@ -73,6 +76,8 @@ public:
 
 private:
     void buildDownlinkChannels();
+    /// Element `index` of Downlink.BWP; fails naming `item` when there is none.
+    std::shared_ptr<Models::Nr5g::NRDLBWP> downlinkBwp(int index, const std::string& item) const;
     void designFilter();
     int filterGuard() const;
     bool takeCancel();

@@ -6,63 +6,19 @@
 #include <cmath>
 #include <complex>
 #include <fstream>
-#include <numbers>
 #include <vector>
 
 #include "../engine/output_files.h"
 #include "../engine/waveform_test_support.h"
 #include "downlink/ssb_reference.h"
+#include "ofdm_receiver.h"
 #include "test_support.h"
 
 namespace {
 
-using Sample = std::complex<double>;
-
-/// One frame as a receiver sees it: the FFT window starts halfway into each cyclic prefix, and
-/// the linear phase that this advance gives is taken out again.
-struct Receiver {
-    std::vector<Sample> samples;
-    int fftSize;
-    std::vector<long> start;  // first sample of each symbol's prefix
-    std::vector<int> prefix;
-
-    Receiver(std::vector<Sample> frame, int size, int mu)
-        : samples(std::move(frame)), fftSize(size) {
-        const int up = static_cast<int>(samples.size() / 307200);  // times 30.72 MHz
-        long position = 0;
-        for (int l = 0; l < 140 << mu; ++l) {
-            start.push_back(position);
-            prefix.push_back(size * 9 / 128 + (l % (7 << mu) == 0 ? 16 * up : 0));
-            position += prefix.back() + size;
-        }
-    }
-
-    /// Subcarrier k (negative below the centre) of symbol l.
-    Sample at(int l, int k) const {
-        const int advance = prefix[l] / 2, bin = (k % fftSize + fftSize) % fftSize;
-        const long begin = start[l] + prefix[l] - advance;
-        Sample sum{};
-        for (int n = 0; n < fftSize; ++n)
-            sum +=
-                samples[begin + n] * std::polar(1.0, -2.0 * std::numbers::pi * bin * n / fftSize);
-        return sum * std::polar(1.0, 2.0 * std::numbers::pi * bin * advance / fftSize);
-    }
-};
-
-/// Error vector magnitude in dB after the best complex gain, which is returned in `gain`.
-template <class T>
-double evmDb(const std::vector<Sample>& received, const std::vector<T>& reference, Sample& gain) {
-    Sample cross{};
-    double energy = 0.0, error = 0.0;
-    for (std::size_t i = 0; i < reference.size(); ++i) {
-        cross += received[i] * std::conj(Sample(reference[i]));
-        energy += std::norm(Sample(reference[i]));
-    }
-    gain = cross / energy;
-    for (std::size_t i = 0; i < reference.size(); ++i)
-        error += std::norm(received[i] - gain * Sample(reference[i]));
-    return 10.0 * std::log10(error / (std::norm(gain) * energy));
-}
+using nrsynth_test::evmDb;
+using nrsynth_test::Receiver;
+using nrsynth_test::Sample;
 
 nlohmann::json example(const char* name) {
     std::ifstream in(nrsynth_test::sourceDir() / "examples" / name);
