@@ -322,6 +322,7 @@ TEST(PdcchNumerology, BuildsOneGeneratorPerEnabledDciOfItsNumerology) {
         dci->CoresetIndex->setValue(1);
         dci->SlotIndexArrayStr->setValue(std::string("0"));
         dci->CCEOffsetStr->setValue(std::string("0"));
+        dci->NumberOfCCE->setValue(2);  // all of the CORESET's 12 REGs
     }
     dcis->getItem(1)->Enabled->setValue(false);
 

@@ -4,6 +4,7 @@
 // TS 38.212 clause 7.3.2 and a successive-cancellation polar decoder undoing clauses 7.3.3,
 // 7.3.4 (5.3.1, 5.4.1) for noise-free hard bits.
 
+#include <algorithm>
 #include <complex>
 #include <cstdint>
 #include <set>
@@ -67,9 +68,9 @@ inline std::set<int> cceRegs(int first, int count, int regs, bool interleaved, i
 /// (TS 38.212 clauses 5.1 and 7.3.2).
 inline Bits crc24c(const Bits& a) {
     static const int g[25] = {1, 1, 0, 1, 1, 0, 0, 1, 0, 1, 0, 1, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 1, 1, 1};
-    Bits work(24, 1);
-    work.insert(work.end(), a.begin(), a.end());
-    work.insert(work.end(), 24, 0);
+    Bits work(a.size() + 48, 0);
+    std::fill(work.begin(), work.begin() + 24, 1);
+    std::copy(a.begin(), a.end(), work.begin() + 24);
     for (std::size_t i = 0; i + 24 < work.size(); ++i)
         if (work[i])
             for (int j = 0; j < 25; ++j) work[i + j] = static_cast<char>(work[i + j] ^ g[j]);
