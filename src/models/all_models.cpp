@@ -1,52 +1,41 @@
 #include "models/all_models.h"
 
-#include "framework/model_container.h"
+#include "framework/model_registration.h"
 #include "framework/text_model.h"
 
 namespace Models::Nr5g {
 
-namespace {
-
-template <class T>
-void registerType() {
-    using namespace Orvalis::Tessaline;
-    Prototype::getInstance<ModelContainer>()->add(Prototype::getInstance<T>(),
-                                                  Prototype::getInstance<RuntimeType<T>>());
-}
-
-}  // namespace
-
 bool registerModelTypes() {
     static const bool done = [] {
-        registerEnumerationDisplayNames();
-        registerType<LTECoexistence>();
-        registerType<LTECRS>();
-        registerType<NR5GWaveformSettings>();
-        registerType<NRCarrier>();
-        registerType<NRCarrierRT>();
-        registerType<NRCORESET>();
-        registerType<NRCSIRS>();
-        registerType<NRDCI>();
-        registerType<NRDLBWP>();
-        registerType<NRDLSCH>();
-        registerType<NRDownlink>();
-        registerType<NRMIB>();
-        registerType<NRPRACH>();
-        registerType<NRPRACHBurst>();
-        registerType<NRPRS>();
-        registerType<NRRateMatchPattern>();
-        registerType<NRResourceGrid>();
-        registerType<NRSRS>();
-        registerType<NRSSPBCH>();
-        registerType<NRUCI>();
-        registerType<NRUCIonPUSCH>();
-        registerType<NRULBWP>();
-        registerType<NRULSCH>();
-        registerType<NRULSCH_RT>();
-        registerType<NRUplink>();
-        registerType<NRUplinkRT>();
-        registerType<PayloadData>();
-        registerType<Orvalis::Tessaline::TextModel>();
+        registerEnumerations();
+        registerModelType_LTECoexistence();
+        registerModelType_LTECRS();
+        registerModelType_NR5GWaveformSettings();
+        registerModelType_NRCarrier();
+        registerModelType_NRCarrierRT();
+        registerModelType_NRCORESET();
+        registerModelType_NRCSIRS();
+        registerModelType_NRDCI();
+        registerModelType_NRDLBWP();
+        registerModelType_NRDLSCH();
+        registerModelType_NRDownlink();
+        registerModelType_NRMIB();
+        registerModelType_NRPRACH();
+        registerModelType_NRPRACHBurst();
+        registerModelType_NRPRS();
+        registerModelType_NRRateMatchPattern();
+        registerModelType_NRResourceGrid();
+        registerModelType_NRSRS();
+        registerModelType_NRSSPBCH();
+        registerModelType_NRUCI();
+        registerModelType_NRUCIonPUSCH();
+        registerModelType_NRULBWP();
+        registerModelType_NRULSCH();
+        registerModelType_NRULSCH_RT();
+        registerModelType_NRUplink();
+        registerModelType_NRUplinkRT();
+        registerModelType_PayloadData();
+        Orvalis::Tessaline::registerModelType<Orvalis::Tessaline::TextModel>();
         return true;
     }();
     return done;

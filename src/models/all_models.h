@@ -31,8 +31,9 @@
 
 namespace Models::Nr5g {
 
-/// Registers all enumerations and model types with the framework; idempotent. Runs at load
-/// in every module that includes this header.
+/// Registers all enumerations and model types with the framework, and TextModel; idempotent.
+/// Each model header registers its own type at load already; this adds TextModel and keeps
+/// one call that names them all.
 bool registerModelTypes();
 
 namespace detail {

@@ -82,4 +82,9 @@ void registerEnumerationDisplayNames() {
     registerDisplayNames<WindowingMethod>();
 }
 
+bool registerEnumerations() {
+    static const bool done = (registerEnumerationDisplayNames(), true);
+    return done;
+}
+
 }  // namespace Models::Nr5g

@@ -235,8 +235,16 @@ enum class WindowingMethod : int { CenteredAtSymbolBoundary, StartingAtSymbolBou
 /// Enumerator name of a numerology ("SCS30k").
 std::string toString(Numerology numerology);
 
-/// Gives every enumeration its display names (run once at load).
+/// Gives every enumeration its display names.
 void registerEnumerationDisplayNames();
+
+/// Runs registerEnumerationDisplayNames once; called at load by every program that includes
+/// this header, which every model header does.
+bool registerEnumerations();
+
+namespace detail {
+inline const bool enumerationsRegistered = registerEnumerations();
+}  // namespace detail
 
 }  // namespace Models::Nr5g
 

@@ -12,4 +12,6 @@ LTECoexistence::LTECoexistence() : ModelBase("LTECoexistence") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(LTECoexistence)
+
 }  // namespace Models::Nr5g

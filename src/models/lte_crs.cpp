@@ -12,4 +12,6 @@ LTECRS::LTECRS() : ModelBase("LTECRS") {
     init(VShift)->setValue(0);
 }
 
+TESSALINE_MODEL_REGISTRATION(LTECRS)
+
 }  // namespace Models::Nr5g

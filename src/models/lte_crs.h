@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -48,5 +49,7 @@ class LTECRS : public ModelBase {
     /// Frequency shift v_shift.
     std::shared_ptr<Int32Setting> VShift = std::make_shared<Int32Setting>("VShift");
 };
+
+TESSALINE_REGISTERED_MODEL(LTECRS)
 
 }  // namespace Models::Nr5g

@@ -53,4 +53,6 @@ NR5GWaveformSettings::NR5GWaveformSettings() : ModelBase("NR5GWaveformSettings")
     init(RegisterValue)->setValue(std::string{});
 }
 
+TESSALINE_MODEL_REGISTRATION(NR5GWaveformSettings)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -157,5 +158,7 @@ class NR5GWaveformSettings : public ModelBase {
     /// Register values of the real-time mode, as text.
     std::shared_ptr<StringSetting> RegisterValue = std::make_shared<StringSetting>("RegisterValue");
 };
+
+TESSALINE_REGISTERED_MODEL(NR5GWaveformSettings)
 
 }  // namespace Models::Nr5g

@@ -46,4 +46,6 @@ NRCarrier::NRCarrier() : ModelBase("NRCarrier") {
     init(PartialFrameConfig)->setValue(std::string{});
 }
 
+TESSALINE_MODEL_REGISTRATION(NRCarrier)
+
 }  // namespace Models::Nr5g

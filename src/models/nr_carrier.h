@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -140,5 +141,7 @@ class NRCarrier : public ModelBase {
     std::shared_ptr<StringSetting> PartialFrameConfig =
         std::make_shared<StringSetting>("PartialFrameConfig");
 };
+
+TESSALINE_REGISTERED_MODEL(NRCarrier)
 
 }  // namespace Models::Nr5g

@@ -47,4 +47,6 @@ NRCarrierRT::NRCarrierRT() : ModelBase("NRCarrierRT") {
     init(PartialFrameConfig)->setValue(std::string{});
 }
 
+TESSALINE_MODEL_REGISTRATION(NRCarrierRT)
+
 }  // namespace Models::Nr5g

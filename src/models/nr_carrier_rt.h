@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -144,5 +145,7 @@ class NRCarrierRT : public ModelBase {
     std::shared_ptr<StringSetting> PartialFrameConfig =
         std::make_shared<StringSetting>("PartialFrameConfig");
 };
+
+TESSALINE_REGISTERED_MODEL(NRCarrierRT)
 
 }  // namespace Models::Nr5g

@@ -17,4 +17,6 @@ NRCORESET::NRCORESET() : ModelBase("NRCORESET") {
     init(PDCCHDMRSScramblingID)->setValue(0);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRCORESET)
+
 }  // namespace Models::Nr5g

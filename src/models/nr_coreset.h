@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -56,5 +57,7 @@ class NRCORESET : public ModelBase {
     std::shared_ptr<Int32Setting> PDCCHDMRSScramblingID =
         std::make_shared<Int32Setting>("PDCCHDMRSScramblingID");
 };
+
+TESSALINE_REGISTERED_MODEL(NRCORESET)
 
 }  // namespace Models::Nr5g

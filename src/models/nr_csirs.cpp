@@ -30,4 +30,6 @@ NRCSIRS::NRCSIRS() : ModelBase("NRCSIRS") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRCSIRS)
+
 }  // namespace Models::Nr5g

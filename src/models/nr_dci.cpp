@@ -42,4 +42,6 @@ NRDCI::NRDCI() : ModelBase("NRDCI") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRDCI)
+
 }  // namespace Models::Nr5g

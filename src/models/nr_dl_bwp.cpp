@@ -21,4 +21,6 @@ NRDLBWP::NRDLBWP() : ModelBase("NRDLBWP") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRDLBWP)
+
 }  // namespace Models::Nr5g

@@ -85,4 +85,6 @@ NRDLSCH::NRDLSCH() : ModelBase("NRDLSCH") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRDLSCH)
+
 }  // namespace Models::Nr5g

@@ -12,4 +12,6 @@ NRDownlink::NRDownlink() : ModelBase("NRDownlink") {
     init(PRS);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRDownlink)
+
 }  // namespace Models::Nr5g

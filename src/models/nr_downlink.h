@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -55,5 +56,7 @@ class NRDownlink : public ModelBase {
     std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRPRS>>> PRS =
         std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRPRS>>>("PRS");
 };
+
+TESSALINE_REGISTERED_MODEL(NRDownlink)
 
 }  // namespace Models::Nr5g

@@ -11,4 +11,6 @@ NRMIB::NRMIB() : ModelBase("NRMIB") {
     init(IntraFreqReselection)->setValue(::Models::Nr5g::IntraFreqReselection::allowed);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRMIB)
+
 }  // namespace Models::Nr5g

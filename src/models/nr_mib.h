@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -44,5 +45,7 @@ class NRMIB : public ModelBase {
     std::shared_ptr<EnumSetting<::Models::Nr5g::IntraFreqReselection>> IntraFreqReselection =
         std::make_shared<EnumSetting<::Models::Nr5g::IntraFreqReselection>>("IntraFreqReselection");
 };
+
+TESSALINE_REGISTERED_MODEL(NRMIB)
 
 }  // namespace Models::Nr5g

@@ -40,4 +40,6 @@ NRPRACH::NRPRACH() : ModelBase("NRPRACH") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRPRACH)
+
 }  // namespace Models::Nr5g

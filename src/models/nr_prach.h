@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -117,5 +118,7 @@ class NRPRACH : public ModelBase {
     /// Host validation state.
     std::shared_ptr<BoolSetting> Valid = std::make_shared<BoolSetting>("Valid");
 };
+
+TESSALINE_REGISTERED_MODEL(NRPRACH)
 
 }  // namespace Models::Nr5g

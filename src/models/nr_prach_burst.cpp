@@ -24,4 +24,6 @@ NRPRACHBurst::NRPRACHBurst() : ModelBase("NRPRACHBurst") {
     init(t_range)->setValue(0.0);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRPRACHBurst)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -68,5 +69,7 @@ class NRPRACHBurst : public ModelBase {
     /// Time range in seconds.
     std::shared_ptr<DoubleSetting> t_range = std::make_shared<DoubleSetting>("t_range");
 };
+
+TESSALINE_REGISTERED_MODEL(NRPRACHBurst)
 
 }  // namespace Models::Nr5g

@@ -30,4 +30,6 @@ NRPRS::NRPRS() : ModelBase("NRPRS") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRPRS)
+
 }  // namespace Models::Nr5g

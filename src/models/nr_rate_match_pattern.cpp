@@ -13,4 +13,6 @@ NRRateMatchPattern::NRRateMatchPattern() : ModelBase("NRRateMatchPattern") {
     init(PeriodicityPatternBitmap)->setValue(std::string{"1"});
 }
 
+TESSALINE_MODEL_REGISTRATION(NRRateMatchPattern)
+
 }  // namespace Models::Nr5g

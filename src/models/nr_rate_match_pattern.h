@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -50,5 +51,7 @@ class NRRateMatchPattern : public ModelBase {
     std::shared_ptr<StringSetting> PeriodicityPatternBitmap =
         std::make_shared<StringSetting>("PeriodicityPatternBitmap");
 };
+
+TESSALINE_REGISTERED_MODEL(NRRateMatchPattern)
 
 }  // namespace Models::Nr5g

@@ -12,4 +12,6 @@ NRResourceGrid::NRResourceGrid() : ModelBase("NRResourceGrid") {
     init(N_RB_low)->setValue(0.0);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRResourceGrid)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -41,5 +42,7 @@ class NRResourceGrid : public ModelBase {
     /// Lowest resource block of the grid.
     std::shared_ptr<DoubleSetting> N_RB_low = std::make_shared<DoubleSetting>("N_RB_low");
 };
+
+TESSALINE_REGISTERED_MODEL(NRResourceGrid)
 
 }  // namespace Models::Nr5g

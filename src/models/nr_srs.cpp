@@ -37,4 +37,6 @@ NRSRS::NRSRS() : ModelBase("NRSRS") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRSRS)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -99,5 +100,7 @@ class NRSRS : public ModelBase {
     /// Host validation state.
     std::shared_ptr<BoolSetting> Valid = std::make_shared<BoolSetting>("Valid");
 };
+
+TESSALINE_REGISTERED_MODEL(NRSRS)
 
 }  // namespace Models::Nr5g

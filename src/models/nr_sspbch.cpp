@@ -35,4 +35,6 @@ NRSSPBCH::NRSSPBCH() : ModelBase("NRSSPBCH") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRSSPBCH)
+
 }  // namespace Models::Nr5g

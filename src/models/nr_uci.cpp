@@ -52,4 +52,6 @@ NRUCI::NRUCI() : ModelBase("NRUCI") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRUCI)
+
 }  // namespace Models::Nr5g

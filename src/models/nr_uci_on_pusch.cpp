@@ -9,4 +9,6 @@ NRUCIonPUSCH::NRUCIonPUSCH() : ModelBase("NRUCIonPUSCH") {
     init(BetaOffsetIndex)->setValue(0);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRUCIonPUSCH)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -38,5 +39,7 @@ class NRUCIonPUSCH : public ModelBase {
     std::shared_ptr<Int32Setting> BetaOffsetIndex =
         std::make_shared<Int32Setting>("BetaOffsetIndex");
 };
+
+TESSALINE_REGISTERED_MODEL(NRUCIonPUSCH)
 
 }  // namespace Models::Nr5g

@@ -13,4 +13,6 @@ NRULBWP::NRULBWP() : ModelBase("NRULBWP") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRULBWP)
+
 }  // namespace Models::Nr5g

@@ -185,4 +185,6 @@ NRULSCH& NRULSCH::operator=(const NRULSCH& other) {
     return *this;
 }
 
+TESSALINE_MODEL_REGISTRATION(NRULSCH)
+
 }  // namespace Models::Nr5g

@@ -100,4 +100,6 @@ NRULSCH_RT::NRULSCH_RT() : ModelBase("NRULSCH_RT") {
     init(Valid)->setValue(false);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRULSCH_RT)
+
 }  // namespace Models::Nr5g

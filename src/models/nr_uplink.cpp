@@ -9,4 +9,6 @@ NRUplink::NRUplink() : ModelBase("NRUplink") {
     init(SRSs);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRUplink)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -43,5 +44,7 @@ class NRUplink : public ModelBase {
     std::shared_ptr<SubSetting<ModelCollection<::Models::Nr5g::NRSRS>>> SRSs =
         std::make_shared<SubSetting<ModelCollection<::Models::Nr5g::NRSRS>>>("SRSs");
 };
+
+TESSALINE_REGISTERED_MODEL(NRUplink)
 
 }  // namespace Models::Nr5g

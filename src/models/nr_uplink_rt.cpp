@@ -11,4 +11,6 @@ NRUplinkRT::NRUplinkRT() : ModelBase("NRUplinkRT") {
     init(SRS);
 }
 
+TESSALINE_MODEL_REGISTRATION(NRUplinkRT)
+
 }  // namespace Models::Nr5g

@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -50,5 +51,7 @@ class NRUplinkRT : public ModelBase {
     std::shared_ptr<SubSetting<::Models::Nr5g::NRSRS>> SRS =
         std::make_shared<SubSetting<::Models::Nr5g::NRSRS>>("SRS");
 };
+
+TESSALINE_REGISTERED_MODEL(NRUplinkRT)
 
 }  // namespace Models::Nr5g

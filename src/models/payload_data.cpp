@@ -9,4 +9,6 @@ PayloadData::PayloadData() : ModelBase("PayloadData") {
     init(UserFile)->setValue(std::string{});
 }
 
+TESSALINE_MODEL_REGISTRATION(PayloadData)
+
 }  // namespace Models::Nr5g

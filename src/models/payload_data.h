@@ -6,6 +6,7 @@
 
 #include "framework/enum_setting.h"
 #include "framework/model_base.h"
+#include "framework/model_registration.h"
 #include "framework/sub_setting.h"
 #include "framework/value_setting.h"
 #include "models/enums.h"
@@ -36,5 +37,7 @@ class PayloadData : public ModelBase {
     /// Path of the user data file.
     std::shared_ptr<StringSetting> UserFile = std::make_shared<StringSetting>("UserFile");
 };
+
+TESSALINE_REGISTERED_MODEL(PayloadData)
 
 }  // namespace Models::Nr5g
