@@ -17,6 +17,18 @@ inline std::filesystem::path sharedDir() {
 /// Folder of the project sources (examples/, data/).
 inline std::filesystem::path sourceDir() { return std::filesystem::path{NRSYNTH_SOURCE_DIR}; }
 
+/// The text of the library failure (a thrown `const char*`) that `run` raises; empty when it
+/// raises none. Other exceptions pass through.
+template <class Run>
+std::string failureText(Run&& run) {
+    try {
+        run();
+    } catch (const char* text) {
+        return text ? std::string(text) : std::string("(null)");
+    }
+    return {};
+}
+
 }  // namespace nrsynth_test
 
 /// Skips the current test when the oracle folder is not beside the checkout.

@@ -7,6 +7,7 @@
 
 #include "coding/crc.h"
 #include "coding/gold_sequence.h"
+#include "common/failure.h"
 #include "downlink/pbch_payload.h"
 #include "downlink/ss_sequences.h"
 #include "downlink/ssb_candidates.h"
@@ -22,9 +23,15 @@ constexpr int kPbchSymbols = 432;  // QPSK symbols of one block
 constexpr int kPolarNMax = 9;
 constexpr int kMaxBlockIndexBits = 8;  // the second scrambling uses at most 3 index bits
 constexpr double kQpsk = 0.7071067811865476;
+// The payload interleaver of TS 38.212 Table 7.1.1-1 places at most 32 bits: A + 8 <= 32.
+constexpr int kMaxPayloadLength = 24;
+// No frame store is 2^22 subcarriers wide (the transform is at most 2048 times 2048 points), so
+// a block centre further out than this can never be mapped; the bound also keeps the column
+// arithmetic of the block and of its reservation, scaled by up to 2^6, within int.
+constexpr int kMaxBlockOffset = 1 << 24;
 
-std::string text(const char* what, int value) {
-    return std::string(what) + std::to_string(value);
+std::string setting(const char* name, long long value) {
+    return std::string(name) + " " + std::to_string(value);
 }
 
 /// The comma list of PowerLevelStr as doubles, with the texts of the list settings on failure.
@@ -44,8 +51,8 @@ std::vector<double> parseLevels(const std::string& list) {
     return levels;
 }
 
-void requireMu(const char* what, int mu) {
-    if (mu < 0 || mu > 6) throw std::invalid_argument(text(what, mu));
+void requireMu(const char* name, int mu) {
+    if (mu < 0 || mu > 6) failWith("The SS/PBCH numerology is out of range (mu 0 to 6).", setting(name, mu));
 }
 
 }  // namespace
@@ -56,8 +63,7 @@ PBCH_Generator::PBCH_Generator()
 
 bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarrier* carrier,
                           int gridWidth) {
-    if (!settings) throw std::invalid_argument("PBCH_Generator::Init: no NRSSPBCH settings");
-    if (!carrier) throw std::invalid_argument("PBCH_Generator::Init: no NRCarrier");
+    if (!settings || !carrier) failWith("The SS/PBCH generator has no settings.");
 
     Name = settings->Name->getValue();
     SsbSymbolsOnly = Name.find("ALLSLOT") == std::string::npos;
@@ -78,20 +84,30 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
     FreqOffset = settings->FrequencyOffset->getValue();
     SfnStart = settings->SFNStart->getValue();
     Boost = std::pow(10.0, settings->PowerBoosting->getValue() / 20.0);
-    if (Lmax < 0 || Lmax > 64) throw std::invalid_argument(text("PBCH_Generator::Init: Lmax ", Lmax));
-    if (CellId < 0 || CellId > 1007) throw std::invalid_argument(text("PBCH_Generator::Init: CellID ", CellId));
-    requireMu("PBCH_Generator::Init: Mu ", Mu);
+    if (Lmax < 0) failWith("Lmax is negative.", setting("SSPBCH.Lmax", Lmax));
+    // nId1 = CellID / 3 and nId2 = CellID mod 3 index the sequences as shifts: any value from 0
+    // up is defined, a negative one would read before them.
+    if (CellId < 0) failWith("CellID is negative: the PSS and SSS have no shift for it.", setting("CellID", CellId));
+    requireMu("SSPBCH.Mu", Mu);
+    if (FreqOffset < -kMaxBlockOffset || FreqOffset > kMaxBlockOffset)
+        failWith("FrequencyOffset puts the SS/PBCH block outside every frame store.",
+                 setting("SSPBCH.FrequencyOffset", FreqOffset));
+    const double pointA = carrier->FrequencyOffsetOfPointA->getValue() / 15000.0 / std::ldexp(1.0, Mu);
+    if (!(std::abs(pointA) < kMaxBlockOffset))
+        failWith("FrequencyOffsetOfPointA out of range.",
+                 "FrequencyOffsetOfPointA " + std::to_string(carrier->FrequencyOffsetOfPointA->getValue()));
 
     auto source = std::make_unique<DataSourceBlock>();
     source->Init(settings->PayloadData->getValue());
     Source = std::move(source);
 
-    const int a = settings->PayloadDataLength->getValue();
-    // K = A + 32 must fit the downlink polar code (at most 164 bits with the interleaver).
-    if (a < 1 || a > 132)
-        throw std::invalid_argument(text("PBCH_Generator::Init: SSPBCH.PayloadDataLength ", a));
-    InterleavedLength = a + 8;
+    // Without channel coding the block carries 864 source bits and the payload length is unused.
+    const int a = ChannelCodingOn ? settings->PayloadDataLength->getValue() : 0;
     if (ChannelCodingOn) {
+        if (a < 0 || a > kMaxPayloadLength)
+            failWith("PayloadDataLength does not fit the PBCH payload interleaver.",
+                     setting("SSPBCH.PayloadDataLength", a));
+        InterleavedLength = a + 8;
         PayloadLength = a;
         Polar.Init(a + 32, kCodedBits, kPolarNMax, 1, 0, 0);
         RateMatch.Init(a + 32, kCodedBits, kPolarNMax, 0);
@@ -104,6 +120,7 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
         PolarBits.assign(static_cast<std::size_t>(Polar.N), 0);
         CrcBits.assign(static_cast<std::size_t>(CrcLength), 0);
     } else {
+        InterleavedLength = 0;
         PayloadLength = kCodedBits;
     }
     RateMatchedBits.assign(kCodedBits, 0);
@@ -111,7 +128,7 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
 
     // Both scramblings draw from the Gold sequence of cInit = CellId: the first up to
     // (v+1)M + 3 bits with v <= 3, the second up to 8 x 864. Drawn once here.
-    const int m = (Lmax == 4 || Lmax == 8) ? a + 5 : a + 2;
+    const int m = ChannelCodingOn ? InterleavedLength - ((Lmax == 4 || Lmax == 8) ? 3 : 6) : 0;
     const int sequenceLength = std::max(kMaxBlockIndexBits * kCodedBits, 4 * m + 3);
     ScramblingSequence.assign(static_cast<std::size_t>(sequenceLength), 0);
     PN_Generator(ScramblingSequence, sequenceLength, CellId);
@@ -121,8 +138,6 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
     Generate_PSS_Signal(CellId % 3, Pss);
     Generate_SSS_Signal(CellId / 3, CellId % 3, Sss);
 
-    PbchSymbols.assign(static_cast<std::size_t>(2 * Lmax), std::vector<complex>(kPbchSymbols));
-    DmrsSymbols.assign(static_cast<std::size_t>(2 * Lmax), std::vector<complex>(kPbchDmrsLength));
     BlockSamples.assign(1152, complex(0.0, 0.0));
     BlockOccupancy.assign(1152, 0);
 
@@ -141,8 +156,7 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
 
     BlockWidth = kSsbSubcarriers;
     BlockStart = FreqOffset - kSsbSubcarriers / 2;
-    PointAOffset = static_cast<int>(carrier->FrequencyOffsetOfPointA->getValue() / 15000.0 /
-                                    std::ldexp(1.0, Mu));
+    PointAOffset = static_cast<int>(pointA);
 
     CandidateSymbols =
         GetSSBCandidateSymbols(Mu, static_cast<int>(settings->SSB30KSymbolIndex->getValue()));
@@ -151,18 +165,19 @@ bool PBCH_Generator::Init(Models::Nr5g::NRSSPBCH* settings, Models::Nr5g::NRCarr
         return false;
     }
     CandidateSymbols.resize(static_cast<std::size_t>(Lmax));
+    // Lmax is at most 64 here: the stores of both half frames' blocks.
+    PbchSymbols.assign(static_cast<std::size_t>(2 * Lmax), std::vector<complex>(kPbchSymbols));
+    DmrsSymbols.assign(static_cast<std::size_t>(2 * Lmax), std::vector<complex>(kPbchDmrsLength));
     return true;
 }
 
 void PBCH_Generator::buildActiveBlocks(int frame) {
     const int halfFrame = 70 << Mu;  // symbols of a half frame in the block's numerology
     int repeats = 1;                 // 2 for a 5 ms period: both half frames
-    int offset = halfFrame * HalfFrame;
     bool active = true;
     switch (Period) {
         case 0:
             repeats = 2;
-            offset = 0;
             break;
         case 1:
             break;
@@ -173,26 +188,28 @@ void PBCH_Generator::buildActiveBlocks(int frame) {
             active = frame % (1 << (Period - 1)) == 0;  // every 2nd, 4th, 8th, 16th frame
             break;
         default:
-            throw std::invalid_argument(text("PBCH_Generator: SSBPeriod ", Period));
+            failWith("SSBPeriod is not one of its enumerators.", setting("SSPBCH.SSBPeriod", Period));
     }
 
     ActiveBase = 0;
     ActiveCount = active ? repeats * Lmax : 0;
     ActiveBlocks.clear();
     if (ActiveCount == 0) return;
-    if (static_cast<int>(CandidateSymbols.size()) < Lmax)
-        throw std::out_of_range("PBCH_Generator: SSBlock Position Calculation Error: Mu " +
-                                std::to_string(Mu) + " has " +
-                                std::to_string(CandidateSymbols.size()) +
-                                " candidate blocks, Lmax " + std::to_string(Lmax));
+    if (static_cast<int>(CandidateSymbols.size()) < Lmax || static_cast<int>(PbchSymbols.size()) < ActiveCount)
+        failWith("SSBlock Position Calculation Error",
+                 setting("SSPBCH.Lmax", Lmax) + " with " + setting("SSPBCH.Mu", Mu));
+    // A burst in a half frame other than 0 or 1 would lie outside the radio frame.
+    if (Period != 0 && (HalfFrame < 0 || HalfFrame > 1))
+        failWith("HalfFrameIndex puts the SS/PBCH burst outside the radio frame.",
+                 setting("SSPBCH.HalfFrameIndex", HalfFrame));
+    const int offset = Period == 0 ? 0 : halfFrame * HalfFrame;
     for (int r = 0; r < repeats; ++r)
         for (int i = 0; i < Lmax; ++i)
             ActiveBlocks.push_back(CandidateSymbols[i] + offset + r * halfFrame);
 }
 
 double PBCH_Generator::levelOf(int block) const {
-    if (DataAmplitude.empty())
-        throw std::invalid_argument("PBCH_Generator: PowerLevelStr holds no level");
+    if (DataAmplitude.empty()) failWith("PowerLevelStr holds no level.", "SSPBCH.PowerLevelStr \"\"");
     return DataAmplitude[static_cast<std::size_t>(block) % DataAmplitude.size()];
 }
 
@@ -218,7 +235,10 @@ void PBCH_Generator::generateBlock(int block, int frame, bool capture) {
         Source->GetOneFrame(RateMatchedBits, kCodedBits);
     } else {
         const int a = PayloadLength;
-        const int sfn = SfnStart + frame;
+        // Only the ten low bits of the system frame number reach the block (MIB bits 1 to 6,
+        // the timing bits and v = (SFN / 2) mod 4), so the sum is taken modulo 1024, where it
+        // cannot overflow, with the same bits as the unreduced number.
+        const int sfn = static_cast<int>((static_cast<long long>(SfnStart) + frame) & 1023);
         if (AutoMib) {
             GenerateMIB(PayloadBits, sfn);
         } else {
@@ -270,9 +290,8 @@ void PBCH_Generator::generateBlock(int block, int frame, bool capture) {
 
 void PBCH_Generator::GenerateMIB(BitSequence& mib, int sfn) {
     if (mib.size() < 24)
-        throw std::out_of_range("PBCH_Generator::GenerateMIB: mib holds " +
-                                std::to_string(mib.size()) + " bits, 24 needed");
-    if (!Mib) throw std::invalid_argument("PBCH_Generator::GenerateMIB: no MIB settings");
+        failWith("The MIB needs 24 bits of payload.", setting("SSPBCH.PayloadDataLength", PayloadLength));
+    if (!Mib) failWith("The SS/PBCH item has no MIB.", "SSPBCH.MIB");
     auto bit = [](int value, int position) { return static_cast<char>((value >> position) & 1); };
 
     mib[0] = 0;  // choice of BCCH-BCH-Message: mib
@@ -290,17 +309,23 @@ void PBCH_Generator::GenerateMIB(BitSequence& mib, int sfn) {
 }
 
 void PBCH_Generator::reserve(OccupancyGrid& occupancy, int firstSymbol, int lastSymbol,
-                             int firstColumn, int endColumn) const {
+                             long long firstColumn, long long endColumn) const {
+    if (firstColumn >= endColumn || firstSymbol > lastSymbol) return;
+    // Negative columns wrap to the top of the store: the span must lie within one width.
+    for (const auto& row : occupancy)
+        if (firstSymbol < 0 || firstColumn < -static_cast<long long>(GridWidth) || endColumn > GridWidth ||
+            static_cast<long long>(lastSymbol + 1) * GridWidth > static_cast<long long>(row.size()))
+            failWith("The SS/PBCH reservation lies outside the frame store.",
+                     setting("SSPBCH.FrequencyOffset", FreqOffset) + ", columns " +
+                         std::to_string(firstColumn) + " to " + std::to_string(endColumn - 1) +
+                         ", symbols " + std::to_string(firstSymbol) + " to " +
+                         std::to_string(lastSymbol) + ", store of " + std::to_string(GridWidth) +
+                         " subcarriers");
     for (auto& row : occupancy) {
         for (int s = firstSymbol; s <= lastSymbol; ++s) {
-            for (int column = firstColumn; column < endColumn; ++column) {
-                const int c = column < 0 ? column + GridWidth : column;
-                const long long index = static_cast<long long>(s) * GridWidth + c;
-                if (s < 0 || c < 0 || c >= GridWidth || index >= static_cast<long long>(row.size()))
-                    throw std::out_of_range("PBCH_Generator::Map: reservation at symbol " +
-                                            std::to_string(s) + ", column " +
-                                            std::to_string(column) + " lies outside the store");
-                int& value = row[static_cast<std::size_t>(index)];
+            int* symbol = row.data() + static_cast<std::size_t>(s) * GridWidth;
+            for (long long column = firstColumn; column < endColumn; ++column) {
+                int& value = symbol[column < 0 ? column + GridWidth : column];
                 if (value == 0) value = kOccupancySsbUnused;
             }
         }
@@ -309,10 +334,12 @@ void PBCH_Generator::reserve(OccupancyGrid& occupancy, int firstSymbol, int last
 
 bool PBCH_Generator::Map(SlotGrid& grid, OccupancyGrid& occupancy, OccupancyGrid& symbolFlags,
                          bool firstChannel, int gridMu, bool extendedCp) {
-    requireMu("PBCH_Generator::Map: gridMu ", gridMu);
+    if (gridMu < 0 || gridMu > 6)
+        failWith("The frame store's numerology is out of range (mu 0 to 6).", setting("gridMu", gridMu));
     const int gridScale = 1 << gridMu;
     const int blockScale = 1 << Mu;
 
+    // Block symbols lie within the block's radio frame (buildActiveBlocks), at most 140 << 6.
     FirstSymbol.resize(static_cast<std::size_t>(ActiveCount));
     LastSymbol.resize(static_cast<std::size_t>(ActiveCount));
     for (int b = 0; b < ActiveCount; ++b) {
@@ -327,20 +354,21 @@ bool PBCH_Generator::Map(SlotGrid& grid, OccupancyGrid& occupancy, OccupancyGrid
         LastSymbol[b] = last;
     }
 
-    // The block's span in resource blocks of the store, counted from point A.
+    // The block's span in resource blocks of the store, counted from point A. FrequencyOffset
+    // and point A are bounded in Init, so the scaled spans fit int; the products are long long.
     const double q = static_cast<double>(blockScale) / gridScale;
     RbStart = static_cast<int>(std::floor((BlockStart - PointAOffset) / 12.0 * q));
-    RbEnd = static_cast<int>(
-                std::floor(((kSsbSubcarriers + BlockStart - PointAOffset) * blockScale - 1) /
-                           (12.0 * gridScale))) +
+    RbEnd = static_cast<int>(std::floor(
+                ((kSsbSubcarriers + static_cast<long long>(BlockStart) - PointAOffset) * blockScale - 1) /
+                (12.0 * gridScale))) +
             1;
     const int base = static_cast<int>(std::floor(PointAOffset * q));
 
     if (ActiveCount > 0 &&
         (GridWidth < 1 || occupancy.size() < grid.size() || symbolFlags.size() < grid.size()))
-        throw std::invalid_argument("PBCH_Generator::Map: store of width " +
-                                    std::to_string(GridWidth) + " with " +
-                                    std::to_string(grid.size()) + " antennas does not match");
+        failWith("The SS/PBCH generator was given a frame store that does not match its width.",
+                 "store of " + std::to_string(GridWidth) + " subcarriers and " +
+                     std::to_string(grid.size()) + " antennas");
 
     bool firstMapped = true;
     for (int b = 0; b < ActiveCount; ++b) {
@@ -348,6 +376,19 @@ bool PBCH_Generator::Map(SlotGrid& grid, OccupancyGrid& occupancy, OccupancyGrid
         const int p = ActiveBlocks[b];
 
         if (!ReserveOnly) {
+            // Negative frequencies sit at the top of the store.
+            if (BlockStart < -GridWidth || BlockStart + BlockWidth > GridWidth)
+                failWith("FrequencyOffset puts the SS/PBCH block outside the frame store.",
+                         setting("SSPBCH.FrequencyOffset", FreqOffset) + " in a store of " +
+                             std::to_string(GridWidth) + " subcarriers");
+            const std::size_t end = static_cast<std::size_t>(p + kSsbSymbols) * GridWidth;
+            for (std::size_t a = 0; a < grid.size(); ++a)
+                if (end > grid[a].size() || end > occupancy[a].size() ||
+                    static_cast<std::size_t>(p + kSsbSymbols) > symbolFlags[a].size())
+                    failWith("The SS/PBCH block lies outside the frame store.",
+                             setting("SSPBCH.Mu", Mu) + " at symbol " + std::to_string(p) +
+                                 " in a store of numerology mu " + std::to_string(gridMu));
+
             const std::size_t level = static_cast<std::size_t>(b);
             const auto at = [level](const std::vector<double>& list) {
                 return list[level % list.size()];
@@ -361,17 +402,9 @@ bool PBCH_Generator::Map(SlotGrid& grid, OccupancyGrid& occupancy, OccupancyGrid
             for (std::size_t a = 0; a < grid.size(); ++a) {
                 for (int s = 0; s < kSsbSymbols; ++s) {
                     const std::size_t row = static_cast<std::size_t>(p + s) * GridWidth;
-                    if (row + GridWidth > grid[a].size() || row + GridWidth > occupancy[a].size() ||
-                        static_cast<std::size_t>(p + s) >= symbolFlags[a].size())
-                        throw std::out_of_range(text("PBCH_Generator::Map: block symbol ", p + s) +
-                                                " lies outside the store");
                     for (int k = 0; k < BlockWidth; ++k) {
                         int c = BlockStart + k;
-                        if (c < 0) c += GridWidth;  // negative frequencies sit at the top
-                        if (c < 0 || c >= GridWidth)
-                            throw std::out_of_range(
-                                text("PBCH_Generator::Map: block column ", BlockStart + k) +
-                                text(" outside a store of width ", GridWidth));
+                        if (c < 0) c += GridWidth;
                         grid[a][row + c] = BlockSamples[s * BlockWidth + k];
                         occupancy[a][row + c] = BlockOccupancy[s * BlockWidth + k];
                     }
@@ -383,7 +416,7 @@ bool PBCH_Generator::Map(SlotGrid& grid, OccupancyGrid& occupancy, OccupancyGrid
         // Withhold whole resource blocks from the later channels.
         const int firstSymbol = SsbSymbolsOnly ? FirstSymbol[b] : 14 * (p / 14);
         const int lastSymbol = SsbSymbolsOnly ? LastSymbol[b] : 14 * (p / 14) + 13;
-        reserve(occupancy, firstSymbol, lastSymbol, base + 12 * RbStart, base + 12 * RbEnd);
+        reserve(occupancy, firstSymbol, lastSymbol, base + 12LL * RbStart, base + 12LL * RbEnd);
     }
     return true;
 }

@@ -128,8 +128,8 @@ class PBCH_Generator {
     void buildActiveBlocks(int frame);
     void generateBlock(int block, int frame, bool capture);
     double levelOf(int block) const;
-    void reserve(OccupancyGrid& occupancy, int firstSymbol, int lastSymbol, int firstColumn,
-                 int endColumn) const;
+    void reserve(OccupancyGrid& occupancy, int firstSymbol, int lastSymbol, long long firstColumn,
+                 long long endColumn) const;
 };
 
 }  // namespace Orvalis_NR

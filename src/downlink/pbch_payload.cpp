@@ -1,14 +1,15 @@
 #include "downlink/pbch_payload.h"
 
-#include <stdexcept>
 #include <string>
+
+#include "common/failure.h"
 
 void Generate_PBCH_Payload(BitSequence& payload, int payloadLength, int sfn, int hrf, int ssbIndex,
                            int lmax, int kSsb) {
     if (payloadLength < 0 || payload.size() < static_cast<std::size_t>(payloadLength) + 8)
-        throw std::out_of_range("Generate_PBCH_Payload: payload holds " +
-                                std::to_string(payload.size()) + " bits, payloadLength " +
-                                std::to_string(payloadLength) + " + 8 needed");
+        Orvalis_NR::failWith("The PBCH payload vector is shorter than PayloadDataLength + 8.",
+                             "SSPBCH.PayloadDataLength " + std::to_string(payloadLength) + ", " +
+                                 std::to_string(payload.size()) + " bits");
     char* timing = payload.data() + payloadLength;
     for (int b = 0; b < 4; ++b) timing[b] = static_cast<char>((sfn >> (3 - b)) & 1);
     timing[4] = static_cast<char>(hrf & 1);
@@ -23,7 +24,9 @@ void Generate_PBCH_Payload(BitSequence& payload, int payloadLength, int sfn, int
 
 PbchInterleaving GetPbchInterleaving(int payloadLength, int lmax, const std::vector<int>& table) {
     const int a = payloadLength;
-    if (a < 0) throw std::out_of_range("GetPbchInterleaving: payloadLength " + std::to_string(a));
+    const std::string value = "SSPBCH.PayloadDataLength " + std::to_string(a);
+    const char* doesNotFit = "PayloadDataLength does not fit the PBCH payload interleaver.";
+    if (a < 0 || a > static_cast<int>(table.size()) - 8) Orvalis_NR::failWith(doesNotFit, value);
     const int total = a + 8;
     PbchInterleaving result;
     result.destination.resize(static_cast<std::size_t>(total));
@@ -44,9 +47,8 @@ PbchInterleaving GetPbchInterleaving(int payloadLength, int lmax, const std::vec
             j = jSsb++;
         else
             j = jOther++;
-        if (j >= static_cast<int>(table.size()) || table[j] >= total)
-            throw std::out_of_range("GetPbchInterleaving: payloadLength " + std::to_string(a) +
-                                    " does not fit the PBCH payload interleaver (24 bits)");
+        if (j >= static_cast<int>(table.size()) || table[j] < 0 || table[j] >= total)
+            Orvalis_NR::failWith(doesNotFit, value);
         const int to = table[j];
         result.destination[k] = to;
         // TS 38.212 clause 7.1.2: the bits the receiver learns from the block's position in

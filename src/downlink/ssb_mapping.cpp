@@ -1,9 +1,9 @@
 #include "downlink/ssb_mapping.h"
 
 #include <algorithm>
-#include <stdexcept>
 #include <string>
 
+#include "common/failure.h"
 #include "downlink/ss_sequences.h"
 
 namespace {
@@ -21,8 +21,8 @@ constexpr int kDataStart[] = {0, 180, 252};
 
 void require(bool ok, const char* function, const char* what, long long value) {
     if (!ok)
-        throw std::invalid_argument(std::string(function) + ": " + what + " " +
-                                    std::to_string(value));
+        Orvalis_NR::failWith("The SS/PBCH block mapping was given unusable sizes.",
+                 std::string(function) + " " + what + " " + std::to_string(value));
 }
 
 void requireSymbol(const char* function, std::size_t symbolSize, std::size_t occupancySize) {

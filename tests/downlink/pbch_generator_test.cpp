@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <cmath>
+#include <functional>
 #include <ostream>
 #include <set>
 #include <stdexcept>
@@ -11,6 +13,7 @@
 
 #include "downlink/pbch_test_support.h"
 #include "downlink/ssb_reference.h"
+#include "test_support.h"
 
 namespace {
 
@@ -215,30 +218,143 @@ TEST(PbchLevels, AnInactiveFrameLeavesTheStoreUntouchedAndAnEmptyListIsRefusedWh
     generator->Map(store.grid, store.occupancy, store.flags, true, 0, false);
     EXPECT_EQ(store.occupancy[0], std::vector<int>(store.occupancy[0].size(), 0));
     EXPECT_EQ(store.flags[0], std::vector<int>(store.flags[0].size(), 0));
-    EXPECT_THROW(generator->Generate(0), std::invalid_argument);
+    EXPECT_EQ(nrsynth_test::failureText([&] { generator->Generate(0); }),
+              "PowerLevelStr holds no level. SSPBCH.PowerLevelStr \"\"");
 }
 
-TEST(PbchSetup, LevelTextIsReadAsAListAndUnusableSettingsOrStoresAreRefused) {
+TEST(PbchSetup, LevelTextIsReadAsAListWithTheTextsOfTheListSettings) {
     EXPECT_EQ(SsbItem(0, 4, SSBPeriod::OneFrame, " 0.25, 2").make(512)->DataAmplitude,
               (std::vector<double>{0.25, 2.0}));
-    EXPECT_THROW(SsbItem(0, 4, SSBPeriod::OneFrame, "1,x").make(512), std::invalid_argument);
+    EXPECT_THROW(
+        {
+            try {
+                SsbItem(0, 4, SSBPeriod::OneFrame, "1,x").make(512);
+            } catch (const std::invalid_argument& e) {
+                EXPECT_STREQ(e.what(), "invalid stod argument");
+                throw;
+            }
+        },
+        std::invalid_argument);
+}
+
+// Settings that would make the block overrun or overflow: each is reported, at the step that
+// uses it, with the setting and its value.
+struct RefusalCase {
+    std::string name;
+    std::function<void(SsbItem&)> set;
+    int gridWidth;
+    std::string expected;
+    friend void PrintTo(const RefusalCase& c, std::ostream* os) { *os << c.name; }
+};
+
+class PbchRefusal : public ::testing::TestWithParam<RefusalCase> {};
+
+TEST_P(PbchRefusal, ReportsTheSettingAndItsValue) {
+    const RefusalCase& c = GetParam();
     SsbItem setup(1, 4);
-    setup.ssb->PayloadDataLength->setValue(30);  // more than the interleaver can place
-    EXPECT_THROW(setup.make(512), std::out_of_range);
-    setup.ssb->ChannelCoding->setValue(false);  // without coding the length is not used
-    EXPECT_NO_THROW(setup.make(512));
-    setup.ssb->FrequencyOffset->setValue(100);  // block up to subcarrier 219 of a 200-wide store
-    auto generator = setup.make(200);
-    Store store(1, 200);
-    generator->Generate(0);
-    EXPECT_THROW(generator->Map(store.grid, store.occupancy, store.flags, false, 1, false),
-                 std::out_of_range);
+    c.set(setup);
+    const std::string text = nrsynth_test::failureText([&] {
+        auto generator = setup.make(c.gridWidth);
+        Store store(1, c.gridWidth);
+        generator->Generate(0);
+        generator->Map(store.grid, store.occupancy, store.flags, false, 1, false);
+    });
+    EXPECT_EQ(text, c.expected);
+}
+
+const std::string kPayloadText = "PayloadDataLength does not fit the PBCH payload interleaver. ";
+const std::string kOffsetText = "FrequencyOffset puts the SS/PBCH block outside every frame store. ";
+const std::string kHalfText = "HalfFrameIndex puts the SS/PBCH burst outside the radio frame. ";
+
+INSTANTIATE_TEST_SUITE_P(
+    Settings, PbchRefusal,
+    ::testing::Values(
+        // The interleaver of TS 38.212 Table 7.1.1-1 places A + 8 <= 32 bits, and A = 20 would
+        // send bits to places 28..31 of a 28-bit word.
+        RefusalCase{"PayloadLongerThanTheInterleaver",
+                    [](SsbItem& s) { s.ssb->PayloadDataLength->setValue(30); }, 512,
+                    kPayloadText + "SSPBCH.PayloadDataLength 30"},
+        RefusalCase{"PayloadAtIntMax",
+                    [](SsbItem& s) { s.ssb->PayloadDataLength->setValue(INT_MAX); }, 512,
+                    kPayloadText + "SSPBCH.PayloadDataLength 2147483647"},
+        RefusalCase{"PayloadShorterThanTheInterleaverReaches",
+                    [](SsbItem& s) { s.ssb->PayloadDataLength->setValue(20); }, 512,
+                    kPayloadText + "SSPBCH.PayloadDataLength 20"},
+        RefusalCase{"PayloadNegative",
+                    [](SsbItem& s) { s.ssb->PayloadDataLength->setValue(-1); }, 512,
+                    kPayloadText + "SSPBCH.PayloadDataLength -1"},
+        RefusalCase{"CellIdNegative", [](SsbItem& s) { s.carrier->CellID->setValue(-3); }, 512,
+                    "CellID is negative: the PSS and SSS have no shift for it. CellID -3"},
+        RefusalCase{"LmaxNegative", [](SsbItem& s) { s.ssb->Lmax->setValue(-1); }, 512,
+                    "Lmax is negative. SSPBCH.Lmax -1"},
+        RefusalCase{"LmaxAboveTheCandidates", [](SsbItem& s) { s.ssb->Lmax->setValue(9); }, 512,
+                    "SSBlock Position Calculation Error SSPBCH.Lmax 9 with SSPBCH.Mu 1"},
+        RefusalCase{"FrequencyOffsetAtIntMin",
+                    [](SsbItem& s) { s.ssb->FrequencyOffset->setValue(INT_MIN); }, 512,
+                    kOffsetText + "SSPBCH.FrequencyOffset -2147483648"},
+        RefusalCase{"FrequencyOffsetAtIntMax",
+                    [](SsbItem& s) { s.ssb->FrequencyOffset->setValue(INT_MAX); }, 512,
+                    kOffsetText + "SSPBCH.FrequencyOffset 2147483647"},
+        // Block up to subcarrier 219 of a store 200 wide.
+        RefusalCase{"BlockBeyondTheStore",
+                    [](SsbItem& s) { s.ssb->FrequencyOffset->setValue(100); }, 200,
+                    "FrequencyOffset puts the SS/PBCH block outside the frame store. "
+                    "SSPBCH.FrequencyOffset 100 in a store of 200 subcarriers"},
+        RefusalCase{"HalfFrameIndexTwo", [](SsbItem& s) { s.ssb->HalfFrameIndex->setValue(2); },
+                    512, kHalfText + "SSPBCH.HalfFrameIndex 2"},
+        RefusalCase{"HalfFrameIndexAtIntMax",
+                    [](SsbItem& s) { s.ssb->HalfFrameIndex->setValue(INT_MAX); }, 512,
+                    kHalfText + "SSPBCH.HalfFrameIndex 2147483647"},
+        RefusalCase{"HalfFrameIndexNegative",
+                    [](SsbItem& s) { s.ssb->HalfFrameIndex->setValue(-1); }, 512,
+                    kHalfText + "SSPBCH.HalfFrameIndex -1"}),
+    [](const auto& info) { return info.param.name; });
+
+TEST(PbchSetup, SettingsThatAreNotUsedAreNotRefused) {
+    // True when the block is generated and mapped without a failure.
+    auto mapsTheBlock = [](SsbItem& setup) {
+        Store store(1, 512);
+        const std::string text = nrsynth_test::failureText([&] {
+            auto generator = setup.make(512);
+            generator->Generate(0);
+            generator->Map(store.grid, store.occupancy, store.flags, false, 1, false);
+        });
+        EXPECT_EQ(text, "");
+        return setup.initResult && store.occupancy[0][store.at(4, -64)] == 380;  // first PSS
+    };
+    // A 5 ms burst takes its half-frame bit from the block index, not from HalfFrameIndex.
+    SsbItem fiveMs(1, 4, SSBPeriod::HalfFrame);
+    fiveMs.ssb->HalfFrameIndex->setValue(INT_MAX);
+    EXPECT_TRUE(mapsTheBlock(fiveMs));
+    // Without channel coding the block carries 864 source bits; the payload length is unused.
+    for (int length : {INT_MIN, -1, 0, 30, INT_MAX}) {
+        SsbItem uncoded(1, 4);
+        uncoded.ssb->ChannelCoding->setValue(false);
+        uncoded.ssb->PayloadDataLength->setValue(length);
+        EXPECT_TRUE(mapsTheBlock(uncoded)) << "PayloadDataLength " << length;
+    }
+}
+
+TEST(PbchSetup, TheSystemFrameNumberEntersTheBlockModulo1024) {
+    // Only the ten LSBs of the SFN are sent: a start at the top of int followed by a few frames
+    // gives the block of the SFN that the sum has modulo 1024, and nothing overflows.
+    auto blockOf = [](int sfnStart, int frame) {
+        SsbItem setup(0, 4, SSBPeriod::OneFrame, "1", 7);
+        setup.ssb->SFNStart->setValue(sfnStart);
+        auto generator = setup.make(512);
+        generator->Generate(frame);
+        return generator->PbchSymbols;
+    };
+    EXPECT_EQ(blockOf(INT_MAX, 5), blockOf(4, 0));      // 2^31 + 4
+    EXPECT_EQ(blockOf(INT_MIN, 6), blockOf(0, 6));      // -2^31 is 0 modulo 1024
+    EXPECT_NE(blockOf(INT_MAX, 5), blockOf(INT_MAX, 6));  // the SFN still moves on
 }
 
 TEST(PbchUncoded, SourceBitsGoStraightToTheSecondScramblingAndFlowOnAcrossBlocks) {
     const std::string pattern = "1110010";
     SsbItem setup(0, 4, SSBPeriod::OneFrame, "1", 33);
     setup.ssb->ChannelCoding->setValue(false);
+    setup.ssb->PayloadDataLength->setValue(INT_MAX);  // not used without coding
     auto payload = setup.ssb->PayloadData->getValue();
     payload->PayLoadDataType->setValue(Models::Nr5g::PayloadDataType::Pattern);
     payload->PatternBits->setValue(pattern);

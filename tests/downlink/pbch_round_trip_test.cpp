@@ -133,7 +133,8 @@ TEST_P(PbchRoundTrip, EveryMappedBlockDecodesToItsMibAndTimingBits) {
     ASSERT_TRUE(generator->Map(store.grid, store.occupancy, store.flags, true, c.mu, false));
     ASSERT_GT(generator->ActiveCount, 0);
 
-    const int sfn = c.sfnStart + c.frame;
+    // The system frame number counts modulo 1024 (TS 38.331): a start near the top of int wraps.
+    const int sfn = static_cast<int>((static_cast<long long>(c.sfnStart) + c.frame) % 1024);
     const Placement place(c.lmax);
     const Bits gold = ssb_ref::goldSequence(c.cellId, 8 * kE);
     const double levels[] = {1.0, 0.5, 2.0};
@@ -209,6 +210,11 @@ INSTANTIATE_TEST_SUITE_P(
                       true, true},
         RoundTripCase{"CaseE_L64_10ms", 4, 0, 64, P::OneFrame, 0, 998, 300, 0, 12, true, true,
                       true},
+        // N_ID past 1007, and so large that the DM-RS cInit passes 2^31; SFN start at the top.
+        RoundTripCase{"CaseA_L8_CellIdPast1007_SfnStartAtIntMax", 0, 0, 8, P::OneFrame, 0, 8000001,
+                      2147483647, 2, 0, true, true, true},
+        RoundTripCase{"CaseB_L4_5ms_CellId1008", 1, 0, 4, P::HalfFrame, 0, 1008, 77, 0, 0, true,
+                      true, true},
         RoundTripCase{"Pattern_L8_OnlySecondScrambling", 0, 0, 8, P::OneFrame, 1, 21, 40, 1, 0,
                       false, false, true},
         RoundTripCase{"Pattern_L4_SecondHalf_Unscrambled", 1, 0, 4, P::OneFrame, 1, 6, 3, 0, 0,

@@ -13,8 +13,10 @@ std::vector<int> asInts(const BitSequence& d) {
 }
 
 TEST(SsSequences, PssAndSssMatchTheClauseRecurrencesAcrossTheCellIds) {
-    // Cell ids on both sides of the N_ID^(1) = 112 and 224 steps of m0, and the last one.
-    for (int cellId : {0, 1, 2, 5, 111 * 3, 112 * 3 + 1, 224 * 3 + 2, 500, 1007}) {
+    // Cell ids on both sides of the N_ID^(1) = 112 and 224 steps of m0, the last of the 1008
+    // physical ids, and ids past it, for which the formulas still hold (m0 mod 127 wraps).
+    for (int cellId : {0, 1, 2, 5, 111 * 3, 112 * 3 + 1, 224 * 3 + 2, 500, 1007, 1008, 128017,
+                       2147483647}) {
         const int nId1 = cellId / 3, nId2 = cellId % 3;
         BitSequence pss(127, 9), sss(127, 9);
         Generate_PSS_Signal(nId2, pss);

@@ -138,7 +138,7 @@ TEST_F(PlainFunctions, ValuesThatWouldBreakTheEngineAreReportedNotCrashed) {
         R"({"SampleRateAuto": 1e9, "NumberOfFrames": 1000})",  // beyond an int of samples
         R"({"SampleRateAuto": 3.84e6, "NumberOfAntennas": -2})",
         R"({"SampleRateAuto": 3e9, "AwgnEnabled": true})",
-        head + R"("CellID": 5000, )" + ssb + "}}}]}",
+        head + R"("CellID": -1, )" + ssb + "}}}]}",  // a negative identity has no PSS shift
         head + ssb + R"(, "PayloadDataLength": 1000000000}}}]})",
         head + ssb + R"(, "Lmax": 100000000}}}]})",
         head + ssb + R"x(, "PayloadData": {"PayLoadDataType": "Pattern",)x" +
