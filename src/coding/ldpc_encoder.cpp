@@ -7,6 +7,7 @@
 #include "coding/ldpc_encoder_core.h"
 #include "coding/ldpc_parity_matrix.h"
 #include "coding/ldpc_tables.h"
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 
@@ -21,10 +22,8 @@ bool LDPC_Encoder::Initialize(int baseGraph, int z) {
             setIndex = static_cast<int>(s) + 1;
         }
     }
-    if (setIndex == 0) {
-        throw std::invalid_argument("LDPC_Encoder::Initialize: z = " + std::to_string(z) +
-                                    " is not a lifting size of TS 38.212 Table 5.3.2-1");
-    }
+    if (setIndex == 0)
+        failWith("The LDPC lifting size is not one of TS 38.212 Table 5.3.2-1.", "Z " + std::to_string(z));
 
     Z = z;
     BaseGraph = baseGraph;

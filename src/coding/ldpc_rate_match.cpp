@@ -1,8 +1,9 @@
 #include "coding/ldpc_rate_match.h"
 
 #include <algorithm>
-#include <stdexcept>
 #include <string>
+
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 namespace {
@@ -31,16 +32,19 @@ bool LDPC_RateMatch::Initialize(LDPC_BaseGraphTypeEnumList baseGraph, int z, int
         ErrorMessage = "Qm should be 1, 2, 4, 6 or 8.";
         return false;
     }
-    if (rv != 0 && z <= 0) {
-        throw std::invalid_argument("LDPC_RateMatch::Initialize: z must be positive, got " +
-                                    std::to_string(z));
-    }
+    // The selection reads the first Ncb of the N encoder outputs, circularly.
+    if (e < 0) failWith("The LDPC rate-matching output length is negative.", "E " + std::to_string(e));
+    if (e > 0 && (ncb < 1 || ncb > n))
+        failWith("The LDPC circular buffer must hold 1 to N bits.",
+                 "Ncb " + std::to_string(ncb) + ", N " + std::to_string(n));
+    if (rv != 0 && z <= 0) failWith("The LDPC lifting size must be positive.", "Z " + std::to_string(z));
     Qm = qm;
-    // TS 38.212 Table 5.4.2.1-2: k0 = floor(w Ncb / (m Zc)) Zc.
+    // TS 38.212 Table 5.4.2.1-2: k0 = floor(w Ncb / (m Zc)) Zc. w Ncb passes int from Ncb of
+    // about 38 million on, so the product is formed in 64 bits; k0 itself is below Ncb.
     static constexpr int kWeights[2][4] = {{0, 17, 33, 56}, {0, 13, 25, 43}};
     const bool graph1 = baseGraph == LDPC_BG1;
-    const int m = graph1 ? 66 : 50;
-    K0 = rv == 0 ? 0 : kWeights[graph1 ? 0 : 1][rv] * ncb / (m * z) * z;
+    const long long m = graph1 ? 66 : 50;
+    K0 = rv == 0 ? 0 : static_cast<int>(kWeights[graph1 ? 0 : 1][rv] * static_cast<long long>(ncb) / (m * z) * z);
     return true;
 }
 
@@ -53,28 +57,24 @@ bool LDPC_RateMatch::Run(std::vector<int>& d, std::vector<int>& f) {
         ErrorMessage = "output f sequence is of wrong length.";
         return false;
     }
-    if (E > 0 && Ncb > N) {
-        throw std::out_of_range("LDPC_RateMatch::Run: Ncb = " + std::to_string(Ncb) +
-                                " exceeds the " + std::to_string(N) + " elements of d");
-    }
+    if (E > 0 && Ncb > N)
+        failWith("The LDPC circular buffer must hold 1 to N bits.",
+                 "Ncb " + std::to_string(Ncb) + ", N " + std::to_string(N));
     selectAndInterleave(d.data(), -2, f.data());
     return true;
 }
 
 bool LDPC_RateMatch::GetPattern(const int* d, int* f) {
-    if (E > 0 && (d == nullptr || f == nullptr)) {
-        throw std::invalid_argument("LDPC_RateMatch::GetPattern: null array");
-    }
+    if (E > 0 && (d == nullptr || f == nullptr)) failWith("LDPC rate matching was given no arrays.", "E " + std::to_string(E));
     selectAndInterleave(d, -1, f);
     return true;
 }
 
 void LDPC_RateMatch::selectAndInterleave(const int* d, int skip, int* f) {
     if (E <= 0) return;
-    if (Ncb <= 0 || Qm <= 0) {
-        throw std::invalid_argument("LDPC_RateMatch: Ncb = " + std::to_string(Ncb) +
-                                    " and Qm = " + std::to_string(Qm) + " must be positive");
-    }
+    if (Ncb <= 0 || Qm <= 0)
+        failWith("LDPC rate matching needs a circular buffer and a modulation order.",
+                 "Ncb " + std::to_string(Ncb) + ", Qm " + std::to_string(Qm));
     // With Qm = 1 the interleaver is the identity and e is written straight into f.
     int* e = f;
     if (Qm != 1) {
@@ -98,10 +98,9 @@ void LDPC_RateMatch::selectAndInterleave(const int* d, int skip, int* f) {
             gathered += v != skip;
         }
         barren = gathered == before ? barren + length : 0;
-        if (barren >= Ncb) {
-            throw std::invalid_argument("LDPC_RateMatch: the " + std::to_string(Ncb) +
-                                        " positions of the circular buffer are all skipped");
-        }
+        if (barren >= Ncb)
+            failWith("The LDPC circular buffer holds only filler bits: the selection would never end.",
+                     "Ncb " + std::to_string(Ncb));
         pos += length;
         if (pos == Ncb) pos = 0;
     }

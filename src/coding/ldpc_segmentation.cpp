@@ -1,11 +1,12 @@
 #include "coding/ldpc_segmentation.h"
 
 #include <algorithm>
-#include <stdexcept>
+#include <climits>
 #include <string>
 
 #include "coding/crc.h"
 #include "coding/ldpc_tables.h"
+#include "common/failure.h"
 
 namespace Orvalis_NR {
 namespace {
@@ -24,33 +25,32 @@ constexpr char kFillerByte = static_cast<char>(254);
 CodeBlockSegmentationLDPC::CodeBlockSegmentationLDPC() : Lifting(allLiftingSizes()) {}
 
 bool CodeBlockSegmentationLDPC::Init(LDPC_BaseGraphTypeEnumList baseGraph, int B) {
-    if (B < 0) {
-        throw std::invalid_argument("CodeBlockSegmentationLDPC::Init: B must not be negative, got " +
-                                    std::to_string(B));
-    }
+    if (B < 0) failWith("The transport block for LDPC segmentation has a negative size.", "B " + std::to_string(B));
     const bool graph1 = baseGraph == LDPC_BG1;
+    const int kcb = graph1 ? 8448 : 3840;
+    // Counted in 64 bits: near INT_MAX the block count and B' = B + 24 C pass int.
+    const long long blocks = B > kcb ? (B + (kcb - 24LL) - 1) / (kcb - 24LL) : 1;
+    const long long withCrc = B + (B > kcb ? 24 * blocks : 0);
+    const long long ceilBits = (withCrc + blocks - 1) / blocks;
+    const int kb = graph1 ? 22 : B > 640 ? 10 : B > 560 ? 9 : B > 192 ? 8 : 6;
+    const long long minimum = (ceilBits + kb - 1) / kb;
+    const auto z = std::find_if(Lifting.begin(), Lifting.end(), [&](int v) { return v >= minimum; });
+    // Every code block is encoded to N = 66 Z or 50 Z bits, and the channels count all of them
+    // in int: a transport block whose encoded blocks pass 2^31 bits cannot be coded.
+    const long long liftingSize = z == Lifting.end() ? Lifting.back() : *z;
+    if (blocks * (graph1 ? 66 : 50) * liftingSize > INT_MAX)
+        failWith("The transport block is too large for LDPC coding: its encoded code blocks would pass 2^31 bits.",
+                 "B " + std::to_string(B));
+
     BaseGraph = baseGraph;
     InputBits = B;
-    Kcb = graph1 ? 8448 : 3840;
-    if (B > Kcb) {
-        CrcPerBlock = 24;
-        Blocks = (B + (Kcb - 24) - 1) / (Kcb - 24);
-        BitsWithCrc = B + 24 * Blocks;
-    } else {
-        CrcPerBlock = 0;
-        Blocks = 1;
-        BitsWithCrc = B;
-    }
-    CeilBlockBits = (BitsWithCrc + Blocks - 1) / Blocks;
-    FloorBlockBits = BitsWithCrc / Blocks;
-
-    if (graph1) {
-        Kb = 22;
-    } else {
-        Kb = B > 640 ? 10 : B > 560 ? 9 : B > 192 ? 8 : 6;
-    }
-    const int minimum = (CeilBlockBits + Kb - 1) / Kb;
-    const auto z = std::find_if(Lifting.begin(), Lifting.end(), [&](int v) { return v >= minimum; });
+    Kcb = kcb;
+    CrcPerBlock = B > kcb ? 24 : 0;
+    Blocks = static_cast<int>(blocks);
+    BitsWithCrc = static_cast<int>(withCrc);
+    CeilBlockBits = static_cast<int>(ceilBits);
+    FloorBlockBits = static_cast<int>(withCrc / blocks);
+    Kb = kb;
     if (z == Lifting.end()) {
         BlockBits.clear();
         FillerBits.clear();
@@ -74,9 +74,8 @@ bool CodeBlockSegmentationLDPC::Go(BitSequence in, std::vector<BitSequence>& blo
         ErrorMessage = "The input size of CodeBlockSegmentationLDPC is wrong! ";
         return false;
     }
-    if (BlockBits.size() != static_cast<std::size_t>(Blocks)) {
-        throw std::logic_error("CodeBlockSegmentationLDPC::Go without a successful Init");
-    }
+    if (BlockBits.size() != static_cast<std::size_t>(Blocks) || Blocks < 1)
+        failWith("LDPC segmentation was run without a successful set-up.", "B " + std::to_string(InputBits));
     blocks.resize(static_cast<std::size_t>(Blocks));
     BitSequence crc(24, 0);
     std::size_t next = 0;

@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <cmath>
-#include <stdexcept>
 #include <string>
 
+#include "common/failure.h"
 #include "tables/tbs_table.h"
 
 namespace Orvalis_NR {
@@ -26,10 +26,7 @@ int truncatedLog2(double x) { return static_cast<int>(std::log10(x) / std::log10
 }  // namespace
 
 int TbsFromTable(int nInfo) {
-    if (nInfo <= 0) {
-        throw std::invalid_argument("TbsFromTable: N_info must be positive, got " +
-                                    std::to_string(nInfo));
-    }
+    if (nInfo <= 0) failWith("The transport block's N_info is not positive.", "N_info " + std::to_string(nInfo));
     const int n = std::max(3, truncatedLog2(nInfo) - 6);
     const int step = 1 << n;
     const int quantised = std::max(24, step * (nInfo / step));
@@ -41,11 +38,11 @@ int TbsFromTable(int nInfo) {
 bool DeterminationTransportBlockSize(int& tbs, int blocks, int a, int b, int prbs) {
     // R = 948/1024 = 0.92578125, exact in binary.
     const double product = resourceElements(prbs) * 0.92578125 * b * a;
-    if (!(product >= 1.0) || product > 2.0e9) {
-        throw std::invalid_argument("DeterminationTransportBlockSize: N_info from a = " +
-                                    std::to_string(a) + ", b = " + std::to_string(b) +
-                                    " is not a positive size");
-    }
+    // N_info must be a positive int: far above any real buffer, 2 10^9 still leaves room for
+    // the rounding steps below.
+    if (!(product >= 1.0) || product > 2.0e9)
+        failWith("The limited-buffer transport block size has no positive N_info.",
+                 "a " + std::to_string(a) + ", b " + std::to_string(b));
     const int nInfo = static_cast<int>(product);
     if (nInfo > 3824) {
         const int x = nInfo - 24;
@@ -55,11 +52,9 @@ bool DeterminationTransportBlockSize(int& tbs, int blocks, int a, int b, int prb
         if (quantised < 8425) {
             tbs = 8 * ((quantised + 24 + 7) / 8) - 24;
         } else {
-            if (blocks <= 0) {
-                throw std::invalid_argument(
-                    "DeterminationTransportBlockSize: blocks must be positive, got " +
-                    std::to_string(blocks));
-            }
+            if (blocks <= 0)
+                failWith("The limited-buffer transport block size needs a positive code block count.",
+                         "C " + std::to_string(blocks));
             const long long unit = 8LL * blocks;
             tbs = static_cast<int>(unit * ((quantised + 24 + unit - 1) / unit) - 24);
         }

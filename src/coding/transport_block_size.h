@@ -7,7 +7,7 @@ namespace Orvalis_NR {
 /// TBS for `prbs` resource blocks (N_RE from the PRB band: 4992 below 33 up to 42588 from
 /// 218), `a` the modulation order and `b` the layer count (callers give 8 and 4), coding rate
 /// 948/1024. Above 8424 bits the caller's code block count `blocks` rounds the size. Always
-/// true; throws std::invalid_argument when N_info is not positive, or when `blocks` is not
+/// true; a library failure when N_info is not a positive int, or when `blocks` is not
 /// positive where it is needed.
 bool DeterminationTransportBlockSize(int& tbs, int blocks, int a, int b, int prbs);
 

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
 #include <random>
 #include <stdexcept>
@@ -10,6 +11,7 @@
 #include <vector>
 
 #include "coding/ldpc_encoder.h"
+#include "test_support.h"
 #include "vector_file.h"
 
 namespace {
@@ -83,12 +85,32 @@ TEST(LdpcRateMatch, Refusals) {
     ASSERT_TRUE(rm.Initialize(LDPC_BG2, 2, 1, 100, 100, 10, 0, 2));
     std::vector<int> d(99, 1), f(10, 0);
     EXPECT_FALSE(rm.Run(d, f));
-    // A buffer of fillers is reported instead of looping forever; so is Ncb above N.
+    // A buffer of fillers is reported instead of looping forever; Ncb above N at set-up.
     d.assign(100, -2);
-    EXPECT_THROW(rm.Run(d, f), std::invalid_argument);
-    ASSERT_TRUE(rm.Initialize(LDPC_BG2, 2, 1, 120, 100, 10, 0, 2));
-    d.assign(100, 1);
-    EXPECT_THROW(rm.Run(d, f), std::out_of_range);
+    EXPECT_EQ(failureText([&] { rm.Run(d, f); }),
+              "The LDPC circular buffer holds only filler bits: the selection would never end. "
+              "Ncb 100");
+    EXPECT_EQ(failureText([&] { rm.Initialize(LDPC_BG2, 2, 1, 120, 100, 10, 0, 2); }),
+              "The LDPC circular buffer must hold 1 to N bits. Ncb 120, N 100");
+}
+
+TEST(LdpcRateMatch, RedundancyVersionStartsStayInsideBuffersOfAnySize) {
+    // w Ncb passes 2^31 from Ncb of about 38 million on (w = 56 for rv 3 of graph 1). The start
+    // k0 of Table 5.4.2.1-2 is a multiple of Z below Ncb, at the fraction w / m of the buffer.
+    for (int ncb : {38347923, 50000000, 2147483647}) {
+        for (int rv = 1; rv < 4; ++rv) {
+            for (int bg : {0, 1}) {
+                const long long w = (bg == 0 ? std::array{17, 33, 56} : std::array{13, 25, 43})[rv - 1];
+                const long long m = bg == 0 ? 66 : 50;
+                LDPC_RateMatch rm;
+                ASSERT_TRUE(rm.Initialize(bg == 0 ? LDPC_BG1 : LDPC_BG2, 384, 1, ncb, ncb, 1, rv, 2));
+                // k0 / Ncb <= w / m < (k0 + Z) / Ncb, in exact integers.
+                EXPECT_EQ(rm.K0 % 384, 0);
+                EXPECT_LE(rm.K0 * m, w * ncb);
+                EXPECT_GT((rm.K0 + 384LL) * m, w * ncb) << "Ncb " << ncb << " rv " << rv;
+            }
+        }
+    }
 }
 
 TEST(LdpcRateMatch, PublishedSelectionAndInterleavingVectors) {

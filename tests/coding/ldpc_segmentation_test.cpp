@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <map>
+#include <utility>
 #include <string>
 #include <vector>
 
@@ -10,6 +11,7 @@
 #include "coding/gold_sequence.h"
 #include "coding/ldpc_encoder.h"
 #include "coding/ldpc_rate_match.h"
+#include "test_support.h"
 #include "vector_file.h"
 
 namespace {
@@ -66,7 +68,36 @@ TEST(LdpcSegmentation, WrongSizesAreRefused) {
     ASSERT_TRUE(seg.Init(LDPC_BG2, 300));
     std::vector<BitSequence> blocks;
     EXPECT_FALSE(seg.Go(BitSequence(299, 0), blocks));
-    EXPECT_THROW(seg.Init(LDPC_BG1, -1), std::invalid_argument);
+    EXPECT_EQ(failureText([&] { seg.Init(LDPC_BG1, -1); }),
+              "The transport block for LDPC segmentation has a negative size. B -1");
+}
+
+TEST(LdpcSegmentation, HugeBlocksAreSegmentedWhileTheirCodeFitsAndRefusedBeyond) {
+    // Up to about 7 10^8 bits the C code blocks of N = 66 Z bits stay below 2^31 bits: the
+    // clause's segmentation, every block at most K_cb with its CRC, the shares differing by one.
+    for (int b : {12345678, 700000000}) {
+        CodeBlockSegmentationLDPC seg;
+        ASSERT_TRUE(seg.Init(LDPC_BG1, b));
+        const long long c = (b + 8423LL) / 8424;
+        EXPECT_EQ(seg.Blocks, c);
+        EXPECT_EQ(seg.BitsWithCrc, b + 24 * c);
+        long long total = 0;
+        for (int bits : seg.BlockBits) {
+            total += bits;
+            EXPECT_LE(bits, seg.K);
+            EXPECT_LE(seg.K, 8448);
+        }
+        EXPECT_EQ(total, seg.BitsWithCrc);
+        EXPECT_LE(seg.CeilBlockBits - seg.FloorBlockBits, 1);
+    }
+    const std::string tooLarge =
+        "The transport block is too large for LDPC coding: its encoded code blocks would pass "
+        "2^31 bits. B ";
+    for (auto [bg, b] : {std::pair{LDPC_BG1, 800000000}, std::pair{LDPC_BG1, 2147483647},
+                         std::pair{LDPC_BG2, 2147483647}}) {
+        CodeBlockSegmentationLDPC seg;
+        EXPECT_EQ(failureText([&] { seg.Init(bg, b); }), tooLarge + std::to_string(b));
+    }
 }
 
 TEST(LdpcSegmentation, PublishedSegmentationVectors) {
