@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cctype>
 #include <ostream>
+#include <random>
 #include <set>
 #include <sstream>
 #include <stdexcept>
@@ -148,6 +149,46 @@ TEST(PolarErrors, RefusalsOfSizesAndParameters) {
     seg.Init(1, CRC_11);
     std::vector<BitSequence> blocks(2);
     EXPECT_FALSE(seg.Go({}, blocks));
+}
+
+// Two-segment UCI (clause 5.2.1 with I_seg = 1, CRC11): an odd payload gets one leading zero
+// in the first block; each block is then polar coded and rate matched on its own (uplink: nMax
+// 10, coded-bit interleaver). All against the reference forms, without the shared vectors.
+TEST(PolarTwoSegments, PaddedBlocksAndTheirCodeWordsFollowTheClauses) {
+    constexpr unsigned long long kCrc11 = 0xE21;  // D^11 + D^10 + D^9 + D^5 + 1
+    struct Case {
+        int A, Er;
+    };
+    for (const Case c : {Case{361, 1200}, Case{1013, 1200}, Case{1706, 1800}, Case{1705, 1800}}) {
+        SCOPED_TRACE("A " + std::to_string(c.A));
+        std::mt19937 rng(static_cast<unsigned>(c.A));
+        const auto a = nrsynth_test::randomBits(static_cast<std::size_t>(c.A), rng);
+        CodeBlockSegmentationPolar seg;
+        ASSERT_TRUE(seg.Init(1, CRC_11));
+        std::vector<BitSequence> blocks;
+        ASSERT_TRUE(seg.Go(a, blocks));
+        const auto ref = polar_ref::segmentUci(a, 2, kCrc11, 11);
+        ASSERT_EQ(blocks, ref);
+        // The padding: the first block opens with a zero, then the payload's first bits.
+        const int padding = c.A % 2;
+        EXPECT_TRUE(std::equal(a.begin(), a.begin() + 100, blocks[0].begin() + padding));
+        if (padding) {
+            EXPECT_EQ(blocks[0][0], 0);
+        }
+
+        const int K = static_cast<int>(ref[0].size());
+        PolarCoding code;
+        ASSERT_TRUE(code.Init(K, c.Er, 10, 0, 0, 0));
+        RateMatchingPolar rm;
+        ASSERT_TRUE(rm.Init(K, c.Er, 10, 1));
+        for (std::size_t r = 0; r < 2; ++r) {
+            BitSequence d(static_cast<std::size_t>(code.N)), f(static_cast<std::size_t>(c.Er));
+            ASSERT_TRUE(code.Encode(blocks[r], d));
+            ASSERT_TRUE(rm.Go(d, f));
+            const auto u = polar_ref::encoderInput(ref[r], c.Er, 10, 0, 0, 0);
+            EXPECT_EQ(f, polar_ref::rateMatch(polar_ref::butterfly(u), K, c.Er, 1)) << "block " << r;
+        }
+    }
 }
 
 // A case of ../shared/testvectors/polar/: the numbers of its header (words such as "CRC11"

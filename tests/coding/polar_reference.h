@@ -30,6 +30,40 @@ inline const std::vector<int>& subBlockPattern() {
     return t;
 }
 
+/// The parity bits of clause 5.1: the remainder of a(D) D^L by the generator `poly` (degree L,
+/// bit i the coefficient of D^i), MSB first.
+inline Bits crcParity(const Bits& a, unsigned long long poly, int L) {
+    unsigned long long r = 0;
+    const unsigned long long top = 1ULL << L;
+    auto step = [&](int bit) {
+        r = (r << 1) | static_cast<unsigned>(bit & 1);
+        if (r & top) r ^= poly;
+    };
+    for (char b : a) step(b);
+    for (int i = 0; i < L; ++i) step(0);
+    Bits p(static_cast<std::size_t>(L));
+    for (int i = 0; i < L; ++i) p[static_cast<std::size_t>(i)] = static_cast<char>((r >> (L - 1 - i)) & 1);
+    return p;
+}
+
+/// Code block segmentation of UCI, clause 5.2.1: A' = ceil(A / C) C, a'_i = 0 for the first
+/// A' - A places and a_(i - (A' - A)) after them; block r is the r-th A' / C bits of a' with
+/// its CRC of generator `poly` and length L appended.
+inline std::vector<Bits> segmentUci(const Bits& a, int C, unsigned long long poly, int L) {
+    const int A = static_cast<int>(a.size());
+    const int aPrime = (A + C - 1) / C * C;
+    Bits padded;
+    for (int i = 0; i < aPrime; ++i) padded.push_back(i < aPrime - A ? 0 : a[static_cast<std::size_t>(i - (aPrime - A))]);
+    std::vector<Bits> blocks;
+    for (int r = 0; r < C; ++r) {
+        Bits block(padded.begin() + r * (aPrime / C), padded.begin() + (r + 1) * (aPrime / C));
+        const Bits parity = crcParity(block, poly, L);
+        block.insert(block.end(), parity.begin(), parity.end());
+        blocks.push_back(block);
+    }
+    return blocks;
+}
+
 /// N of clause 5.3.1 with logarithms in double, as the clause writes it.
 inline int codeLength(int K, int E, int nMax) {
     const double logE = std::ceil(std::log2(static_cast<double>(E)));

@@ -6,6 +6,7 @@
 #include <complex>
 #include <numbers>
 #include <stdexcept>
+#include <vector>
 
 namespace {
 
@@ -37,6 +38,33 @@ TEST(SincLowPass, SymmetricWithTheEnergyOfTheNormalisation) {
         for (bool window : {false, true})
             EXPECT_NEAR(energy(Generate_SincLowPass(0.21, 301, normalise, window)), normalise,
                         1e-12 * normalise);
+}
+
+// The design pinned by value: h[i] = b sinc(b x_i) (0.54 + 0.46 cos(2 pi x_i / n)) with
+// x_i = i - n/2 + 1/2, scaled to unit energy. The values were computed apart from this code
+// (40-digit arithmetic). A Hann window, or a Hamming window stretched over n - 1 points or
+// centred on n/2, gives coefficients that differ by 0.01 or more.
+TEST(SincLowPass, WindowedDesignHasThePinnedCoefficients) {
+    struct Pinned {
+        double b;
+        std::vector<double> h;
+    };
+    const Pinned cases[] = {
+        {0.3,
+         {-0.0036338794742028472877, 0.072770511584226217456, 0.33328257913522461022,
+          0.61936578046313610531, 0.61936578046313610531, 0.33328257913522461022,
+          0.072770511584226217456, -0.0036338794742028472877}},
+        {0.45,
+         {-0.020391078547500133678, 0.03697589123452513092, 0.4465520515248859928,
+          0.77305659904304266006, 0.4465520515248859928, 0.03697589123452513092,
+          -0.020391078547500133678}},
+    };
+    for (const auto& c : cases) {
+        const auto h = Generate_SincLowPass(c.b, static_cast<int>(c.h.size()), 1, true);
+        ASSERT_EQ(h.size(), c.h.size());
+        for (std::size_t i = 0; i < h.size(); ++i)
+            EXPECT_NEAR(h[i], c.h[i], 1e-15) << "b " << c.b << " i " << i;
+    }
 }
 
 class SincLowPassResponse : public ::testing::TestWithParam<double> {};
