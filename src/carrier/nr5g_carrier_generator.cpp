@@ -6,6 +6,7 @@
 #include <numeric>
 
 #include "common/failure.h"
+#include "downlink/pdsch_generator.h"
 
 namespace Orvalis_NR {
 
@@ -214,7 +215,10 @@ void NR5GCarrierGenerator::Go(int frame, int numberOfFrames, bool secondPass) {
 
 void NR5GCarrierGenerator::Cancel() {
     cancelled.store(1, std::memory_order_relaxed);
-    for (auto& numerology : numerologies) numerology.cancelRequested.store(1, std::memory_order_relaxed);
+    for (auto& numerology : numerologies) {
+        numerology.cancelRequested.store(1, std::memory_order_relaxed);
+        for (auto* pdsch : numerology.pdschGenerators) pdsch->CancelRequested.store(1, std::memory_order_relaxed);
+    }
 }
 
 void NR5GCarrierGenerator::ResetDataSource() {

@@ -6,6 +6,7 @@
 
 #include "downlink/pbch_generator.h"
 #include "downlink/pdcch_generator.h"
+#include "downlink/pdsch_generator.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
 #include "common/log.h"
@@ -37,6 +38,7 @@ bool isRealTime(PhaseCompensationMode mode) {
 NR5GNumerologyGenerator::~NR5GNumerologyGenerator() {
     for (auto* generator : pbchGenerators) delete generator;
     for (auto* generator : pdcchGenerators) delete generator;
+    for (auto* generator : pdschGenerators) delete generator;
 }
 
 void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform, Models::Nr5g::NRCarrier& owner,
@@ -79,10 +81,15 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
     pbchGenerators.clear();
     for (auto* generator : pdcchGenerators) delete generator;
     pdcchGenerators.clear();
+    for (auto* generator : pdschGenerators) delete generator;
+    pdschGenerators.clear();
     lowestSubcarrier = 360000;
     highestSubcarrier = 0;
     transformPrecoded = false;
-    if (owner.CarrierType->getValue() == CarrierType::DL) buildDownlinkChannels();
+    if (owner.CarrierType->getValue() == CarrierType::DL) {
+        buildDownlinkChannels();
+        buildPdschChannels();
+    }
     if (!hasValidChannel) return;
     if (fftSize < 1) failWith("SampleRateAuto is too low for this numerology.", "SampleRateAuto " + std::to_string(sampleRate));
 
@@ -150,6 +157,34 @@ std::shared_ptr<Models::Nr5g::NRDLBWP> NR5GNumerologyGenerator::downlinkBwp(int 
     return bwp;
 }
 
+void NR5GNumerologyGenerator::buildPdschChannels() {
+    auto downlink = carrier->Downlink->getValue();
+    auto items = downlink->DLSCH->getValue();
+    std::vector<PRS_Generator*> prs;
+    Log("Start Init PDSCH");
+    for (int i = 0; i < items->getCount(); ++i) {
+        auto item = items->getItem(i);
+        if (!item->Enabled->getValue()) continue;
+        auto bwp = downlinkBwp(item->BWPIndex->getValue(), "Downlink.DLSCH[" + std::to_string(i) + "]");
+        if (static_cast<int>(bwp->Numerology->getValue()) != numerology) continue;
+        auto* generator = new PDSCH_Generator();
+        pdschGenerators.push_back(generator);
+        generator->Init(carrier, item.get(), bwp.get(), fftSize, pbchGenerators, pdcchGenerators, prs);
+        hasValidChannel = true;
+        int smallest = -1, largest = -1;
+        for (int n = 0; n < static_cast<int>(generator->RbMask.size()); ++n)
+            if (generator->RbMask[static_cast<std::size_t>(n)]) {
+                if (smallest < 0) smallest = n;
+                largest = n;
+            }
+        if (smallest < 0) continue;
+        const int offset = generator->Bwp->RBOffset->getValue();
+        lowestSubcarrier = std::min((offset + smallest) * 12, lowestSubcarrier);
+        highestSubcarrier = std::max((offset + largest) * 12 + 11, highestSubcarrier);
+    }
+    Log("End Init PDSCH");
+}
+
 int NR5GNumerologyGenerator::filterGuard() const {
     std::string name;
     if (carrier->CarrierType->getValue() == CarrierType::UL) {
@@ -199,6 +234,7 @@ std::vector<int> NR5GNumerologyGenerator::countChannels() const {
     for (const auto* generator : pbchGenerators)
         if (!generator->ReserveOnly) ++counts[static_cast<std::size_t>(channelOrder[PlacePBCH])];
     counts[static_cast<std::size_t>(channelOrder[PlacePDCCH])] += static_cast<int>(pdcchGenerators.size());
+    counts[static_cast<std::size_t>(channelOrder[PlacePDSCH])] += static_cast<int>(pdschGenerators.size());
     return counts;
 }
 
@@ -270,6 +306,9 @@ void NR5GNumerologyGenerator::MarkUnavailable() {
 void NR5GNumerologyGenerator::ResetDataSource() {
     for (auto* generator : pbchGenerators) if (generator->Source) generator->Source->Reset();
     for (auto* generator : pdcchGenerators) if (generator->Source) generator->Source->Reset();
+    for (auto* generator : pdschGenerators)
+        for (auto& codeWord : generator->CodeWords)
+            if (codeWord.Source) codeWord.Source->Reset();
 }
 
 bool NR5GNumerologyGenerator::takeCancel() { return cancelRequested.exchange(0, std::memory_order_relaxed) != 0; }
@@ -336,7 +375,7 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     bool anyMapped = false;
     Log("Start Generate PBCH");
     for (auto* generator : pbchGenerators) {
-        const bool markAlc = isPrimary && !generator->ReserveOnly;  // no PDSCH generator exists here
+        const bool markAlc = isPrimary && !generator->ReserveOnly && pdschGenerators.empty();
         generator->Generate(frame);
         generator->Map(grid, occupancy, symbolMarks, markAlc, mu, extendedCp);
         if (!generator->ReserveOnly) anyMapped = true;
@@ -348,11 +387,22 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     if (!pdcchGenerators.empty()) Log("Start Generate PDCCH");
     for (auto* generator : pdcchGenerators) {
         if (static_cast<int>(generator->GetNumerology()) != numerology) continue;
-        const bool markAlc = isPrimary && pbchGenerators.empty();  // and no PDSCH generator
+        const bool markAlc = isPrimary && pbchGenerators.empty() && pdschGenerators.empty();
         generator->Map(grid, occupancy, frame, symbolMarks, markAlc);
         anyMapped = true;
     }
     if (!pdcchGenerators.empty()) Log("End Generate PDCCH");
+    if (takeCancel()) return;
+
+    if (!pdschGenerators.empty()) Log("Start Generate PDSCH");
+    for (std::size_t i = 0; i < pdschGenerators.size(); ++i) {
+        auto* generator = pdschGenerators[i];
+        if (static_cast<int>(generator->GetNumerology()) != numerology) continue;
+        generator->Map(grid, occupancy, frame, symbolMarks, isPrimary && i == 0);
+        anyMapped = true;
+        if (takeCancel()) return;
+    }
+    if (!pdschGenerators.empty()) Log("End Generate PDSCH");
     if (takeCancel()) return;
     if (!anyMapped) return;
 

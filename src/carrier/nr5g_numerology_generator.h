@@ -18,6 +18,7 @@ namespace Orvalis_NR {
 
 class PBCH_Generator;
 class PDCCH_Generator;
+class PDSCH_Generator;
 
 /// Places of the channel kinds in a count vector.
 enum ChannelPlace { PlacePBCH, PlacePDSCH, PlacePDCCH, PlaceCSIRS, PlacePUSCH, PlacePUCCH, PlaceSRS, PlacePRS };
@@ -68,6 +69,7 @@ public:
     int channelOrder[8] = {0, 1, 2, 3, 4, 5, 6, 7};
     std::vector<PBCH_Generator*> pbchGenerators;
     std::vector<PDCCH_Generator*> pdcchGenerators;
+    std::vector<PDSCH_Generator*> pdschGenerators;
     std::vector<std::shared_ptr<Filter>> filters;
     int sampleDelay = 0;
     std::atomic<char> cancelRequested{0};
@@ -78,6 +80,7 @@ private:
     void buildDownlinkChannels();
     /// Element `index` of Downlink.BWP; fails naming `item` when there is none.
     std::shared_ptr<Models::Nr5g::NRDLBWP> downlinkBwp(int index, const std::string& item) const;
+    void buildPdschChannels();
     void designFilter();
     int filterGuard() const;
     bool takeCancel();
