@@ -170,9 +170,9 @@ void PDCCH_Generator::readCoreset(Models::Nr5g::NRDCI* dci) {
     if (id == 0 && InitialBwp) {
         // CORESET 0 of the initial BWP: contiguous RBs, DM-RS counted from its own first RB.
         CoresetRbs = Coreset->RBNumber->getValue();
-        const int start = Coreset->RBOffset->getValue();
+        const int start = coresetStart();  // an offset of -1 starts on the six-RB grid
         if (CoresetRbs < 1 || start < 0 || start + CoresetRbs > bwpRbs)
-            failWith("CORESET 0 does not fit the bandwidth part.", where + ".RBOffset " + std::to_string(start) +
+            failWith("CORESET 0 does not fit the bandwidth part.", where + ".RBOffset " + std::to_string(Coreset->RBOffset->getValue()) +
                                                                        ", RBNumber " + std::to_string(CoresetRbs));
         for (int i = 0; i < CoresetRbs; ++i) walk_.push_back({start + i, 3 * i});
     } else {

@@ -163,6 +163,29 @@ TEST(PdcchGenerator, ThreeSymbolsOneCceCarry108Bits) {
     EXPECT_EQ(generator->SymbolCount, 54);
 }
 
+TEST(PdcchGenerator, WithoutCodingTheSourceBitsAreScrambledStraightIntoQpsk) {
+    PdcchItem item;
+    item.dci->ChannelCoding->setValue(false);
+    item.dci->AutoDCI->setValue(true);
+    item.dci->DCIBits->setValue(std::string("110x"));  // anything but '1' is a 0
+    item.dci->PDCCHDMRSScramblingID->setValue(321);
+    item.dci->CRNTI->setValue(0x2468);
+    for (bool scrambled : {true, false}) {
+        item.dci->Scrambling->setValue(scrambled);
+        auto generator = item.make();
+        generator->Generate(3);
+        ASSERT_EQ(generator->DataSymbols.size(), 54u);
+        const auto c = pdcch_ref::gold((0x2468u << 16) + 321u, 108);
+        for (int i = 0; i < 108; ++i) {
+            const char source = "1100"[i % 4] == '1';
+            const char bit = static_cast<char>(scrambled ? source ^ c[i] : source);
+            const auto symbol = generator->DataSymbols[static_cast<std::size_t>(i / 2)];
+            const double part = i % 2 ? symbol.imag() : symbol.real();
+            EXPECT_NEAR(part, bit ? -std::sqrt(0.5) : std::sqrt(0.5), 1e-12) << i;
+        }
+    }
+}
+
 TEST(PdcchGenerator, CoresetMapFollowsTheSixRbGridOfTheBwp) {
     PdcchItem item;
     item.bwp->RBOffset->setValue(3);  // next multiple of 6 is CRB 6: BWP RB 3
