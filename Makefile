@@ -1,9 +1,20 @@
 # Quick start: `make demo` and `make test`. Everything else is for developers.
-.PHONY: deps build demo test test-asan bench format clean
+.PHONY: help deps build demo test test-asan fuzz fuzz-ci bench format clean
 
 JOBS ?= 2
+FUZZ_SECONDS ?= 600
 CLI := build/release/apps/nrsynth/nrsynth
 DEMO_WAVE ?= examples/ssb_case_c_30khz.json
+
+help:
+	@echo "make demo            install deps, build, generate the default example waveform"
+	@echo "make test            install deps, build (g++, release) and run the test suite"
+	@echo "make test-asan       the same suite under ASan + UBSan (clang); builds the fuzz targets"
+	@echo "make fuzz            run each fuzz target FUZZ_SECONDS (default 600) seconds"
+	@echo "make fuzz-ci         run each fuzz target of the asan build for a minute"
+	@echo "make bench           run the benchmarks"
+	@echo "make format          clang-format the sources"
+	@echo "make clean           remove build/"
 
 deps:
 	@bash scripts/deps.sh
@@ -22,6 +33,16 @@ test-asan: deps
 	@cmake --preset asan >/dev/null
 	@cmake --build --preset asan -j $(JOBS)
 	@ctest --preset asan
+
+# The fuzz targets are part of the sanitizer build (clang, ASan + UBSan, libFuzzer).
+fuzz: deps
+	@cmake --preset asan >/dev/null
+	@cmake --build --preset asan -j $(JOBS) --target nrsynth_fuzz_document nrsynth_fuzz_valid_document nrsynth_fuzz_dictionary
+	@bash scripts/fuzz.sh $(FUZZ_SECONDS)
+
+# CI: a minute per fuzz target on what `make test-asan` built.
+fuzz-ci:
+	@bash scripts/fuzz.sh 60
 
 bench: build
 	@build/release/bench/nrsynth_bench

@@ -7,6 +7,7 @@ packages=(
   libfftw3-dev nlohmann-json3-dev libmsgsl-dev libcli11-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   python3 python3-numpy
+  clang libclang-rt-dev
 )
 
 missing=()
