@@ -26,10 +26,10 @@ using Orvalis::Tessaline::ModelCollectionBase;
 
 // Caps that keep one run to a fraction of a second under the sanitizers. They bound the
 // cost of a run, not what the library accepts: the library sees the capped tree whole.
-constexpr double kMaxSampleRate = 7.68e6;
-constexpr int kMaxFrames = 2;
+constexpr double kMaxSampleRate = 3.84e6;
+constexpr int kMaxFrames = 1;
 constexpr int kMaxSubframes = 20;
-constexpr int kMaxAntennas = 4;
+constexpr int kMaxAntennas = 2;
 constexpr int kMaxCarriers = 2;
 constexpr int kMaxItemsPerCollection = 4;
 
@@ -117,7 +117,8 @@ bool runDocument(const std::string& json, Expect expect) {
     StartDeserialize(json.c_str());
     checkOutcome("Deserialize Error! ", expect);
     if (GetStatus() != 0 || !gSettings) return false;
-    capRun(*gSettings);
+    // A valid document is run as it stands: its generator keeps it small.
+    if (expect == Expect::AnyReportedOutcome) capRun(*gSettings);
 
     clearOutput();
     const std::string output = (outputFolder() / "wave.bin").string();

@@ -25,13 +25,13 @@ struct CarrierShape {
     double minimumSampleRate;
 };
 
-constexpr std::array<CarrierShape, 4> kShapes{{
+constexpr std::array<CarrierShape, 3> kShapes{{
     {0, "SCS15k", "FR1_5M", 25, 7.68e6},
     {0, "SCS15k", "FR1_10M", 52, 15.36e6},
     {1, "SCS30k", "FR1_10M", 24, 15.36e6},
-    {1, "SCS30k", "FR1_20M", 51, 30.72e6},
 }};
-constexpr std::array<double, 3> kSampleRates{7.68e6, 15.36e6, 30.72e6};
+// Rates that keep one run short under the sanitizers; the shapes above fit them.
+constexpr std::array<double, 2> kSampleRates{7.68e6, 15.36e6};
 constexpr std::array<const char*, 4> kMarkers{"WaveformStart", "FrameStart", "AlcControl",
                                               "RfBlanking"};
 constexpr std::array<const char*, 3> kPhaseModes{"Auto", "Manual", "Off"};
@@ -127,7 +127,7 @@ json document(FuzzedDataProvider& in) {
     const int subframes = in.ConsumeIntegralInRange(1, 10);
     json doc = {
         {"SampleRateAuto", sampleRate},
-        {"NumberOfFrames", in.ConsumeIntegralInRange(1, 2)},
+        {"NumberOfFrames", 1},
         {"NumberOfSubframes", subframes},
         {"SubframeOffset", in.ConsumeIntegralInRange(0, 10 - subframes)},
         {"NumberOfAntennas", in.ConsumeIntegralInRange(1, 2)},
