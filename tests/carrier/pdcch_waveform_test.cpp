@@ -165,7 +165,7 @@ Occasion receive(const Receiver& rx, const DciCase& c, int slot, int cceOffset) 
 
     const int dmrsId = c.scramblingId == -1 ? c.cellId : c.scramblingId;
     Occasion occasion;
-    double dataLevel = 0, dmrsLevel = 0;
+    double dataLevel = 0;
     int dataCount = 0;
     for (int l = 0; l < c.symbols; ++l) {
         const int symbol = 14 * slot + c.firstSymbol + l;
@@ -192,7 +192,6 @@ Occasion receive(const Receiver& rx, const DciCase& c, int slot, int cceOffset) 
         }
         Sample gain;
         occasion.worstDmrsEvmDb = std::max(occasion.worstDmrsEvmDb, nrsynth_test::evmDb(dmrsRx, dmrsRef, gain));
-        dmrsLevel += std::abs(gain);
         for (const Sample& value : data) {
             const Sample equalised = value / gain;
             occasion.hard.push_back(equalised.real() < 0);
