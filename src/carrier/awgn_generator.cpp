@@ -8,6 +8,7 @@
 #include "dsp/filter.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
+#include "common/sample_rate_guard.h"
 
 namespace Orvalis_NR {
 
@@ -18,15 +19,19 @@ void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWavefor
     numberOfAntennas = waveform.NumberOfAntennas->getValue();
     NR5GCarrierGenerator::numberOfAntennas = numberOfAntennas;
     const double rate = waveform.SampleRateAuto->getValue();
-    if (!(rate >= 100.0) || !(rate <= 2.0e9))
-        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(rate));
+    requireGeneratingSampleRate(rate);
+    if (numberOfAntennas < 0)
+        failWith("NumberOfAntennas is negative.", "NumberOfAntennas " + std::to_string(numberOfAntennas));
     const double noiseBandwidth = waveform.NoiseBandwidth->getValue();
     if (!(noiseBandwidth > 0.0))
-        failWith("NoiseBandwidth must be positive.", "NoiseBandwidth " + std::to_string(noiseBandwidth));
+        failWith("NoiseBandwidth must be above 0 Hz: the noise level is the square root of its share of the sample "
+                 "rate, and the noise filter would have no pass band.",
+                 "NoiseBandwidth " + numberText(noiseBandwidth));
 
     const double ratio = waveform.CarrierToNoiseRatio->getValue();
     if (!std::isfinite(ratio))
-        failWith("CarrierToNoiseRatio must be a finite number.", "CarrierToNoiseRatio " + std::to_string(ratio));
+        failWith("CarrierToNoiseRatio must be a finite number: otherwise the noise has no standard deviation.",
+                 "CarrierToNoiseRatio " + numberText(ratio));
     const double bandwidth = std::min(rate, noiseBandwidth * 1.25);
     const double x = bandwidth / rate;
     sigma = waveform.AwgnEnabled->getValue()

@@ -6,6 +6,7 @@
 #include <numeric>
 
 #include "common/failure.h"
+#include "common/sample_rate_guard.h"
 #include "downlink/pdsch_generator.h"
 
 namespace Orvalis_NR {
@@ -23,6 +24,9 @@ void NR5GCarrierGenerator::Init(Models::Nr5g::NRCarrier& carrierSettings, Models
     multiCarrier = waveform.NRCarriers->getValue()->getCount() > 1;
     numberOfAntennas = waveform.NumberOfAntennas->getValue();
     startSample = start;
+    requireGeneratingSampleRate(waveform.SampleRateAuto->getValue());
+    if (numberOfAntennas < 0)
+        failWith("NumberOfAntennas is negative.", "NumberOfAntennas " + std::to_string(numberOfAntennas));
 
     const auto type = carrierSettings.CarrierType->getValue();
     numerologyCount = (type == CarrierType::DL || type == CarrierType::UL) ? 6 : 0;
@@ -44,18 +48,17 @@ void NR5GCarrierGenerator::Init(Models::Nr5g::NRCarrier& carrierSettings, Models
     }
 
     const double rate = waveform.SampleRateAuto->getValue();
-    if (!(rate >= 1000.0) || rate > 2.0e9)
-        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(rate));
     const int wholeRate = static_cast<int>(rate);
     frameLength = wholeRate / 100;
     outputLength = std::min(totalSamples, frameLength);
     samplesPerMillisecond = wholeRate / 1000;
-    if (startSample < 0 || startSample >= frameLength)
-        failWith("SubframeOffset puts the waveform start outside the frame.", "SubframeOffset " +
-                                                                                   std::to_string(waveform.SubframeOffset->getValue()));
-    if (type == CarrierType::CW && rate < 30000.0)
-        failWith("SampleRateAuto is too low for a continuous-wave carrier.", "SampleRateAuto " + std::to_string(rate));
-    if (numberOfAntennas < 0) failWith("NumberOfAntennas is negative.", std::to_string(numberOfAntennas));
+    if (startSample < 0 || (startSample > 0 && startSample >= frameLength))
+        failWith("SubframeOffset puts the waveform start outside the frame.",
+                 "SubframeOffset " + std::to_string(waveform.SubframeOffset->getValue()));
+    if (type == CarrierType::CW && static_cast<int>(rate / 30000) == 0)
+        failWith("A continuous-wave carrier needs SampleRateAuto of at least 30000 Hz: its level divides by the "
+                 "rate over 30 kHz, truncated.",
+                 "SampleRateAuto " + numberText(rate));
 
     const auto rows = static_cast<std::size_t>(numberOfAntennas);
     currentSamples.assign(rows, std::vector<std::complex<double>>(static_cast<std::size_t>(outputLength)));

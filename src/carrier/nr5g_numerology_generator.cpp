@@ -9,6 +9,8 @@
 #include "downlink/pdsch_generator.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
+#include "common/list_text.h"
+#include "common/sample_rate_guard.h"
 #include "common/log.h"
 
 namespace Orvalis_NR {
@@ -28,6 +30,10 @@ struct NumerologyGeometry {
 // Numerology (position of the enumeration) to mu, prefix and symbols per slot.
 constexpr NumerologyGeometry kGeometry[6] = {{0, false, 14}, {1, false, 14}, {2, false, 14},
                                              {2, true, 12},  {3, false, 14}, {4, false, 14}};
+
+// Point A further away than this (2^29 subcarriers of 15 kHz) overflows the filter's centre,
+// which adds its subcarrier offset twice.
+constexpr double kFarthestPointA = 15000.0 * (1 << 29);
 
 bool isRealTime(PhaseCompensationMode mode) {
     return mode == PhaseCompensationMode::AutoRT || mode == PhaseCompensationMode::ManualRT;
@@ -56,9 +62,8 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
 
     // Relate the sample rate to the base rate of 30.72 MHz.
     sampleRate = waveform.SampleRateAuto->getValue();
+    requireGeneratingSampleRate(sampleRate);
     const double ratio = sampleRate > 3.072e7 ? sampleRate / 3.072e7 : 3.072e7 / sampleRate;
-    if (!(sampleRate > 0.0) || !(ratio < 2048.0))
-        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(sampleRate));
     const int up = sampleRate > 3.072e7 ? static_cast<int>(ratio) : 1;
     const int down = sampleRate > 3.072e7 ? 1 : static_cast<int>(ratio);
 
@@ -71,11 +76,10 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
     fftSize = (2048 / down * up) / (1 << mu);
 
     const double pointA = owner.FrequencyOffsetOfPointA->getValue();
-    if (!(std::abs(pointA) <= 1.0e10))
-        failWith("FrequencyOffsetOfPointA out of range.", "FrequencyOffsetOfPointA " + std::to_string(pointA));
-    const double windowBeta = owner.WindowBeta->getValue();
-    if (!(windowBeta >= 0.0 && windowBeta <= 1.0))
-        failWith("WindowBeta out of range.", "WindowBeta " + std::to_string(windowBeta));
+    if (!(std::abs(pointA) <= kFarthestPointA))
+        failWith("FrequencyOffsetOfPointA is too far from the carrier centre: its distance in subcarriers, taken "
+                 "twice, would overflow an int.",
+                 "FrequencyOffsetOfPointA " + numberText(pointA));
 
     for (auto* generator : pbchGenerators) delete generator;
     pbchGenerators.clear();
@@ -91,13 +95,19 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
         buildPdschChannels();
     }
     if (!hasValidChannel) return;
-    if (fftSize < 1) failWith("SampleRateAuto is too low for this numerology.", "SampleRateAuto " + std::to_string(sampleRate));
+    if (fftSize < 1)
+        failWith("SampleRateAuto is too low for a channel in this numerology: its transform would have no sample.",
+                 "SampleRateAuto " + numberText(sampleRate) + ", numerology " + std::to_string(index));
+    const auto phaseMode = waveform.PhaseCompensation->getValue();
+    const double windowBeta = owner.WindowBeta->getValue();
+    if (!isRealTime(phaseMode) && !(windowBeta >= 0.0 && windowBeta <= 1.0))
+        failWith("WindowBeta must lie from 0 to 1: a symbol's window cannot be longer than its transform.",
+                 "WindowBeta " + numberText(windowBeta));
 
     // The first symbol of each half subframe carries the longer prefix.
     cpLengths.assign(static_cast<std::size_t>(symbolsPerSlot * slotsPerSubframe / 2), extendedCp ? fftSize / 4 : fftSize * 9 / 128);
     if (!extendedCp) cpLengths[0] = 16 / down * up + fftSize * 9 / 128;
 
-    const auto phaseMode = waveform.PhaseCompensation->getValue();
     modulator.windowLength = isRealTime(phaseMode) ? 0 : static_cast<int>(std::lround(fftSize * windowBeta));
     modulator.centred = owner.WindowingMethod->getValue() == WindowingMethod::CenteredAtSymbolBoundary ? 1 : 0;
     modulator.oversampling = 1;
@@ -195,12 +205,8 @@ int NR5GNumerologyGenerator::filterGuard() const {
         if (bwps->getCount() >= 2) name = bwps->getItem(1)->Name->getValue();
     }
     const auto at = name.find("FB");
-    if (at != std::string::npos) {
-        const std::string digit = name.substr(at + 2, 1);
-        if (digit.empty() || digit[0] < '0' || digit[0] > '9')
-            throw std::invalid_argument("bandwidth part Name \"" + name + "\": no guard digit after \"FB\"");
-        return digit[0] - '0';
-    }
+    // The guard is the one character after "FB"; no digit there is the conversion's failure.
+    if (at != std::string::npos) return intFromText(name.substr(at + 2, 1));
     return fftSize > 8192 ? fftSize / 8192 : 1;
 }
 
@@ -254,19 +260,8 @@ void NR5GNumerologyGenerator::MarkUnavailable() {
         const int ports = crs->NumberOfCRSAntennaPorts->getValue();
         const int vShift = crs->VShift->getValue();
         bool mbsfn[10] = {};
-        const std::string list = crs->MBSFNSubframeIndexArrayStr->getValue();
-        for (std::size_t start = 0; start < list.size();) {
-            const auto comma = std::min(list.find(',', start), list.size());
-            int subframe = 0;
-            try {
-                subframe = std::stoi(list.substr(start, comma - start));
-            } catch (const std::logic_error&) {
-                throw std::invalid_argument("LTECRS[" + std::to_string(c) + "].MBSFNSubframeIndexArrayStr \"" + list +
-                                            "\": not a comma list of subframe numbers");
-            }
+        for (const int subframe : intsFromCommaList(crs->MBSFNSubframeIndexArrayStr->getValue()))
             if (subframe >= 0 && subframe < 10) mbsfn[subframe] = true;
-            start = comma + 1;
-        }
         auto usesSymbol = [ports](int l) {
             if (ports == 1 || ports == 2) return l == 0 || l == 4 || l == 7 || l == 11;
             if (ports == 4) return l == 0 || l == 1 || l == 4 || l == 7 || l == 8 || l == 11;
