@@ -1,12 +1,19 @@
 #include "engine/nr5g_engine.h"
 
+#include <algorithm>
 #include <cmath>
+#include <filesystem>
 #include <limits>
+
+#if defined(__unix__) || defined(__APPLE__)
+#include <sys/resource.h>
+#endif
 
 #include "carrier/awgn_generator.h"
 #include "carrier/nr5g_carrier_generator.h"
 #include "coding/table_edition.h"
 #include "common/failure.h"
+#include "common/sample_rate_guard.h"
 #include "framework/tools.h"
 
 namespace Orvalis_NR {
@@ -18,55 +25,93 @@ using Models::Nr5g::NR5GWaveformSettings;
 
 namespace {
 
-int toSampleCount(double value, const char* what) {
-    if (!(value >= 0.0) || value > static_cast<double>(std::numeric_limits<int>::max()))
-        failWith("Waveform length out of range.", std::string(what) + " " + std::to_string(value) + " samples");
+// A length or offset in samples: the engine keeps them as int, and a negative one is no length.
+int toSampleCount(long double value, const char* what, const std::string& settingsText) {
+    if (!(value >= 0.0L) || value > static_cast<long double>(std::numeric_limits<int>::max()))
+        failWith(what, settingsText + " give " + numberText(static_cast<double>(value)) + " samples");
     return static_cast<int>(value);
+}
+
+constexpr const char* kTotalOutOfRange = "The waveform length is out of range: it must be 0 to 2147483647 samples.";
+constexpr const char* kStartOutOfRange = "The waveform start is out of range: it must be 0 to 2147483647 samples.";
+
+// How many of the slots first .. first + count - 1 are 0 or slots / 2, the slots whose first
+// symbol has the longer prefix (one slot when slots / 2 is 0 too).
+long long longSlotsAmong(long long first, long long count, int slots) {
+    if (count <= 0) return 0;
+    auto contains = [&](long long slot) { return slot >= first && slot < first + count; };
+    long long found = contains(0) ? 1 : 0;
+    if (slots / 2 != 0 && contains(slots / 2)) ++found;
+    return found;
+}
+
+// Each antenna keeps a sample file and a marker file open for the whole run: more antennas
+// than the process may open files for cannot be written.
+void requireOpenFiles(int antennas) {
+#if defined(__unix__) || defined(__APPLE__)
+    rlimit limit{};
+    if (getrlimit(RLIMIT_NOFILE, &limit) != 0 || limit.rlim_cur == RLIM_INFINITY) return;
+    if (2 * static_cast<unsigned long long>(antennas) > static_cast<unsigned long long>(limit.rlim_cur))
+        failWith("NumberOfAntennas needs more open files than this process may have: two per antenna.",
+                 "NumberOfAntennas " + std::to_string(antennas) + ", open-file limit " +
+                     std::to_string(static_cast<unsigned long long>(limit.rlim_cur)));
+#else
+    (void)antennas;
+#endif
 }
 
 }  // namespace
 
 WaveformLength ComputeWaveformLength(const NR5GWaveformSettings& settings) {
     const double sampleRate = settings.SampleRateAuto->getValue();
-    if (!(sampleRate > 0.0) || !(sampleRate <= 2.0e9))
-        failWith("SampleRateAuto is not a usable sample rate.", "SampleRateAuto " + std::to_string(sampleRate));
+    if (!(sampleRate >= 0.0) || std::isinf(sampleRate))
+        failWith("SampleRateAuto must be a number from 0 up: the waveform would have no length.",
+                 "SampleRateAuto " + numberText(sampleRate));
+    const int frames = settings.NumberOfFrames->getValue();
+    const int subframes = settings.NumberOfSubframes->getValue();
+    const int subframeOffset = settings.SubframeOffset->getValue();
     WaveformLength length;
-    length.totalSamples = toSampleCount(
-        settings.NumberOfFrames->getValue() * sampleRate / 1000 * settings.NumberOfSubframes->getValue(), "total");
-    length.startSample = toSampleCount(settings.SubframeOffset->getValue() * sampleRate / 1000, "start");
+    length.totalSamples = toSampleCount(frames * sampleRate / 1000 * subframes,
+                                        kTotalOutOfRange,
+                                        "NumberOfFrames " + std::to_string(frames) + ", NumberOfSubframes " +
+                                            std::to_string(subframes) + " and SampleRateAuto " + numberText(sampleRate));
+    length.startSample = toSampleCount(subframeOffset * sampleRate / 1000, kStartOutOfRange,
+                                       "SubframeOffset " + std::to_string(subframeOffset) + " and SampleRateAuto " +
+                                           numberText(sampleRate));
 
     const auto carriers = settings.NRCarriers->getValue();
-    if (settings.NumberOfSlotsInSubframe->getValue() == -1 || carriers->getCount() == 0) return length;
+    const int count = settings.NumberOfSlotsInSubframe->getValue();
+    if (count == -1 || carriers->getCount() == 0) return length;
 
-    // Cut to slots, in the first carrier's numerology.
+    // Cut to slots, in the first carrier's numerology. The slot sizes come from integer
+    // arithmetic on the rate, which must therefore be an int.
+    if (sampleRate > kHighestSampleRate) requireGeneratingSampleRate(sampleRate);
     const int n = static_cast<int>(carriers->getItem(0)->Numerology->getValue());
     static constexpr int kSlots[6] = {1, 2, 4, 4, 8, 16};
     if (n < 0 || n > 5) failWith("Numerology out of range.", "NRCarriers[0].Numerology " + std::to_string(n));
     const int slots = kSlots[n];
     const bool extended = n == 3;
-    const long fft = static_cast<long>(sampleRate / (slots * 15000));
-    const long ratio = static_cast<long>(sampleRate / 15000 / 2048);
-    long cp = fft * 144 / 2048;
-    long cpLong = ratio * 16 + cp;
+    const long long fft = static_cast<long long>(sampleRate / (slots * 15000));
+    const long long ratio = static_cast<long long>(sampleRate / 15000 / 2048);
+    long long cp = fft * 144 / 2048;
+    long long cpLong = ratio * 16 + cp;
     if (extended) cpLong = cp = fft * 512 / 2048;
-    const long slotLength = (fft + cp) * (extended ? 12 : 14);
-    const long longSlot = slotLength - cp + cpLong;
+    const long long slotLength = (fft + cp) * (extended ? 12 : 14);
     const int offset = settings.SlotOffsetInSubframe->getValue();
-    const int count = settings.NumberOfSlotsInSubframe->getValue();
-    if (offset < 0 || count < 0 || offset > 1 << 20 || count > 1 << 20)
-        failWith("Slot cut out of range.", "SlotOffsetInSubframe " + std::to_string(offset) + ", NumberOfSlotsInSubframe " +
-                                                std::to_string(count));
-    double start = length.startSample;
-    for (int i = 0; i < offset; ++i) start += (i == 0 || i == slots / 2) ? longSlot : slotLength;
-    double total = 0;
-    for (int i = offset; i < offset + count; ++i) {
-        if (n == 0)
-            total += slotLength + (cpLong - cp) * 2;
-        else
-            total += (i == 0 || i == slots / 2) ? longSlot : slotLength;
-    }
-    length.startSample = toSampleCount(start, "start");
-    length.totalSamples = toSampleCount(total, "total");
+
+    // Slots before the offset (none for an offset of -1 or below), then the slots kept. For
+    // 15 kHz only the kept slots all count the longer prefix twice.
+    const long long before = std::max(offset, 0);
+    const long double start =
+        length.startSample + static_cast<long double>(before) * slotLength + longSlotsAmong(0, before, slots) * (cpLong - cp);
+    const long long kept = std::max(count, 0);
+    const long double total = n == 0 ? static_cast<long double>(kept) * (slotLength + (cpLong - cp) * 2)
+                                     : static_cast<long double>(kept) * slotLength +
+                                           longSlotsAmong(offset, kept, slots) * (cpLong - cp);
+    const std::string cut = "SlotOffsetInSubframe " + std::to_string(offset) + ", NumberOfSlotsInSubframe " +
+                            std::to_string(count) + " and SampleRateAuto " + numberText(sampleRate);
+    length.startSample = toSampleCount(start, kStartOutOfRange, "SubframeOffset " + std::to_string(subframeOffset) + ", " + cut);
+    length.totalSamples = toSampleCount(total, kTotalOutOfRange, cut);
     return length;
 }
 
@@ -80,15 +125,23 @@ NR5GEngine::NR5GEngine() = default;
 NR5GEngine::~NR5GEngine() = default;
 
 void NR5GEngine::Init(NR5GWaveformSettings& waveform, const char* outputPath) {
-    ready = false;
+    ready.store(false, std::memory_order_release);
+    ran.store(false, std::memory_order_relaxed);  // a new Init makes the engine ready for one more run
     settings = &waveform;
     numberOfAntennas = waveform.NumberOfAntennas->getValue();
-    if (numberOfAntennas < 0 || numberOfAntennas > 1024)
-        failWith("NumberOfAntennas out of range.", "NumberOfAntennas " + std::to_string(numberOfAntennas));
+    if (numberOfAntennas < 0)
+        failWith("NumberOfAntennas is negative.", "NumberOfAntennas " + std::to_string(numberOfAntennas));
+    requireOpenFiles(numberOfAntennas);
     fileBuffers.clear();
     fileBuffers.resize(static_cast<std::size_t>(numberOfAntennas));
 
     const auto length = ComputeWaveformLength(waveform);
+    // Whatever generates samples needs a rate with a defined frame length; an empty waveform
+    // (no enabled carrier, no noise) needs none.
+    auto carriers = waveform.NRCarriers->getValue();
+    bool generates = waveform.AwgnEnabled->getValue();
+    for (int c = 0; c < carriers->getCount(); ++c) generates = generates || carriers->getItem(c)->Enabled->getValue();
+    if (generates) requireGeneratingSampleRate(waveform.SampleRateAuto->getValue());
     totalSamples = length.totalSamples;
     startSample = length.startSample;
 
@@ -102,7 +155,7 @@ void NR5GEngine::Init(NR5GWaveformSettings& waveform, const char* outputPath) {
 
     if (waveform.Capability->getValue() == CapabilityEnum::Realtime)
         failWith("Real-time Uplink waveforms are not available in this version.", "Capability Realtime");
-    numberOfCarriers = waveform.NRCarriers->getValue()->getCount();
+    numberOfCarriers = carriers->getCount();
     carrierGenerators.clear();
     for (int c = 0; c < numberOfCarriers; ++c) carrierGenerators.push_back(std::make_unique<NR5GCarrierGenerator>());
 
@@ -116,7 +169,7 @@ void NR5GEngine::Init(NR5GWaveformSettings& waveform, const char* outputPath) {
     if (waveform.AwgnEnabled->getValue()) noiseGenerator = std::make_unique<AwgnGenerator>();
 
     selectTableEdition();
-    ready = true;
+    ready.store(true, std::memory_order_release);
 }
 
 void NR5GEngine::selectTableEdition() {
@@ -191,7 +244,8 @@ void NR5GEngine::runCarrier(NR5GCarrierGenerator& generator, int offset, Compute
     }
 
     // The first half of frame 0, now complete with what came over from the last frame.
-    static std::vector<char> halfMarkers;
+    // Kept from run to run; one per thread, so that engines on two threads do not share it.
+    thread_local std::vector<char> halfMarkers;
     const auto half = generator.currentSamples.empty() ? 0 : generator.currentSamples[0].size() / 2;
     halfFrame.resize(half);
     if (halfMarkers.size() != half) halfMarkers.resize(half);
@@ -206,11 +260,19 @@ void NR5GEngine::runCarrier(NR5GCarrierGenerator& generator, int offset, Compute
 }
 
 void NR5GEngine::Go() {
-    if (!ready) failWith("The engine is not set up: InitEngine did not complete.");
-    if (ran) failWith("The engine has already run: call InitEngine first.");
-    ran = true;
+    if (!ready.load(std::memory_order_acquire)) failWith("The engine is not set up: InitEngine did not complete.");
+    if (ran.exchange(true)) failWith("The engine has already run: call InitEngine first.");
     auto carriers = settings->NRCarriers->getValue();
     numberOfCarriers = carriers->getCount();
+    // Generators and files were made for the tree as Init saw it.
+    if (numberOfCarriers != static_cast<int>(carrierGenerators.size()))
+        failWith("NRCarriers changed between Init and Go: a new Init is needed.",
+                 "NRCarriers " + std::to_string(carrierGenerators.size()) + " at Init, " +
+                     std::to_string(numberOfCarriers) + " now");
+    if (settings->NumberOfAntennas->getValue() != numberOfAntennas)
+        failWith("NumberOfAntennas changed between Init and Go: a new Init is needed.",
+                 "NumberOfAntennas " + std::to_string(numberOfAntennas) + " at Init, " +
+                     std::to_string(settings->NumberOfAntennas->getValue()) + " now");
     const int numberOfFrames = settings->NumberOfFrames->getValue();
     const bool hasNoise = settings->AwgnEnabled->getValue();
     bool anyEnabled = false;
@@ -248,8 +310,26 @@ void NR5GEngine::Go() {
         throw;
     }
     for (auto& buffer : fileBuffers) buffer.Close();
-    if (cancelled.exchange(false, std::memory_order_relaxed))
+    if (cancelled.exchange(false, std::memory_order_relaxed)) {
         for (auto& buffer : fileBuffers) buffer.Delete();
+        return;
+    }
+    if (!firstCarrier) requireFullFiles();
+}
+
+void NR5GEngine::requireFullFiles() const {
+    const auto expected = static_cast<std::uintmax_t>(totalSamples);
+    for (const auto& buffer : fileBuffers) {
+        const std::pair<const std::string*, std::uintmax_t> files[] = {
+            {&buffer.sampleFileName, expected * sizeof(std::complex<double>)}, {&buffer.markerFileName, expected}};
+        for (const auto& [name, bytes] : files) {
+            std::error_code error;
+            const auto size = std::filesystem::file_size(*name, error);
+            if (error || size != bytes)
+                failWith("An output file does not hold the whole waveform.",
+                         *name + ": " + (error ? error.message() : std::to_string(size) + " bytes, " + std::to_string(bytes) + " expected"));
+        }
+    }
 }
 
 }  // namespace Orvalis_NR

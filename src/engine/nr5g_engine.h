@@ -66,9 +66,12 @@ private:
     void runCarrier(NR5GCarrierGenerator& generator, int offset, ComputeFrame&& computeFrame, bool resetData,
                     bool& firstCarrier);
     void selectTableEdition();
+    /// Fails naming the first file whose length is not that of the whole waveform.
+    void requireFullFiles() const;
 
-    bool ran = false;
-    bool ready = false;  // Init completed
+    // Atomic, so that a second Go on another thread (or one racing an Init) finds out safely.
+    std::atomic<bool> ran{false};    // Go has started
+    std::atomic<bool> ready{false};  // Init completed
     std::mutex generatorsMutex;  // Cancel may walk carrierGenerators from another thread
 };
 

@@ -14,7 +14,8 @@ public:
     NR5GEngineWrapper();
     virtual ~NR5GEngineWrapper();
 
-    /// The caller keeps the tree alive until the run is over.
+    /// The wrapper keeps the tree alive until the next Init. Go fails when the tree no longer has
+    /// the carriers or antennas that Init saw.
     void Init(std::shared_ptr<Models::Nr5g::NR5GWaveformSettings> settings, std::string outputPath);
     void InitTestVectorGenerator(bool enable, std::string exportFolder);
     void Go();
