@@ -29,7 +29,9 @@ using Sample = std::complex<double>;
 
 constexpr double kRate = 30.72e6;                    // 4 samples of frame-start marker at this rate
 constexpr int kFrame = 307200;                       // samples per 10 ms frame
-const double kCwLevel = std::sqrt(3276.0) / 1024.0;  // (1/sqrt(n)) sqrt(3276/n), n = rate / 30 kHz
+// Root mean power of 3276 unit subcarriers through a 1024-point (30 kHz at this rate) inverse
+// transform scaled by 1 / 1024; checked by synthesis in ContinuousWaveLevel.
+const double kCwLevel = std::sqrt(3276.0) / 1024.0;
 
 // Marker bytes with the default lines: Marker1 waveform start, Marker2 frame start,
 // Marker3 RF blanking (bit 2), Marker4 RF ALC (bit 3).

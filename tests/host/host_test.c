@@ -70,6 +70,13 @@ int main(int argc, char** argv) {
     check(fileSize(markers) == 153600LL, "marker file holds one byte per sample");
     check(GetGenerationProgress() == 0.0, "progress stays 0");
 
+    /* The empty document: no carrier, sample rate 0, empty files and success. */
+    StartDeserialize("{}");
+    InitEngine(path);
+    RunEngine();
+    check(GetStatus() == 0, "the empty document runs");
+    check(fileSize(path) == 0 && fileSize(markers) == 0, "the empty document gives empty files");
+
     /* A failure: the log starts afresh with the failure. */
     InitEngine("x");
     check(GetStatus() == -1, "too short a path is status -1");

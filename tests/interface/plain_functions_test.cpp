@@ -2,9 +2,13 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <chrono>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <string>
+#include <thread>
 
 #include "../engine/output_files.h"
 #include "../engine/waveform_test_support.h"
@@ -134,7 +138,6 @@ TEST_F(PlainFunctions, ValuesThatWouldBreakTheEngineAreReportedNotCrashed) {
                             R"( {"Enabled": true, "Numerology": "SCS15k", "Mu": 0, "Lmax": 4,)"
                             R"( "PowerLevelStr": "1")";
     const std::string documents[] = {
-        R"({"SampleRateAuto": 0})",
         R"({"SampleRateAuto": 1e9, "NumberOfFrames": 1000})",  // beyond an int of samples
         R"({"SampleRateAuto": 3.84e6, "NumberOfAntennas": -2})",
         R"({"SampleRateAuto": 3e9, "AwgnEnabled": true})",
@@ -145,8 +148,6 @@ TEST_F(PlainFunctions, ValuesThatWouldBreakTheEngineAreReportedNotCrashed) {
             R"x( "PatternBits": "PN23(0:2147483647)"}}}}]})x",
         head + R"("WindowBeta": 2, )" + ssb + "}}}]}",
         head + R"("FrequencyOffsetOfPointA": 1e300, )" + ssb + "}}}]}",
-        head + ssb + R"(}, "LTECoexistence": {"Enabled": true,)" +
-            R"( "LTECRS": [{"MBSFNSubframeIndexArrayStr": "1,x"}]}}}]})",
     };
     for (const auto& document : documents) {
         StartDeserialize(document.c_str());
@@ -181,6 +182,85 @@ TEST_F(PlainFunctions, ReplacingTheSettingsKeepsTheEnginesTreeAlive) {
     RunEngine();
     ASSERT_EQ(GetStatus(), 0) << GetLog();
     EXPECT_EQ(nrsynth_test::readSamples(path).size(), 38400u);  // the engine ran on the first tree
+}
+
+// The empty document is a waveform of no carrier at sample rate 0: empty files, and success.
+TEST_F(PlainFunctions, EmptyDocumentGivesEmptyFiles) {
+    StartDeserialize("{}");
+    InitEngine(path.c_str());
+    RunEngine();
+    EXPECT_EQ(GetStatus(), 0);
+    EXPECT_STREQ(GetLog(), "Deserialize OK! \r\nInit Engine OK! \r\nRun Engine OK! ");
+    ASSERT_TRUE(std::filesystem::exists(path));
+    EXPECT_EQ(std::filesystem::file_size(path), 0u);
+    EXPECT_EQ(std::filesystem::file_size(path + ".mkr"), 0u);
+}
+
+// List settings and the guard digit of a bandwidth part name fail with the texts of the
+// string-to-int conversion, whatever the standard library's own texts are.
+TEST_F(PlainFunctions, BadNumbersInListsAndNamesGiveTheConversionTexts) {
+    const std::string ssb = R"("CarrierType": "DL", "Numerology": "SCS15k", "Downlink": {"SSPBCH":)"
+                            R"( {"Enabled": true, "Numerology": "SCS15k", "Mu": 0, "Lmax": 4,)"
+                            R"( "PowerLevelStr": "1"})";
+    auto withCrs = [&](const char* list) {
+        return R"({"SampleRateAuto": 7.68e6, "NRCarriers": [{)" + ssb +
+               R"(, "LTECoexistence": {"Enabled": true, "LTECRS": [{"MBSFNSubframeIndexArrayStr": ")" + list +
+               R"("}]}}}]})";
+    };
+    auto withBwpName = [&](const char* name) {
+        return R"({"SampleRateAuto": 7.68e6, "NRCarriers": [{)" + ssb + R"(, "BWP": [{}, {"Name": ")" + name +
+               R"("}]}}]})";
+    };
+    struct Case {
+        std::string document;
+        const char* text;
+    } cases[] = {
+        {withCrs("1,x"), "invalid stoi argument"},
+        {withCrs("1,,2"), "invalid stoi argument"},
+        {withCrs("99999999999"), "stoi argument out of range"},
+        {withBwpName("BWP FBx"), "invalid stoi argument"},
+        {withBwpName("FB"), "invalid stoi argument"},
+        {withBwpName("FB-1"), "invalid stoi argument"},
+    };
+    for (const auto& c : cases) {
+        StartDeserialize(c.document.c_str());
+        ASSERT_EQ(GetStatus(), 0) << GetLog();
+        InitEngine(path.c_str());
+        ASSERT_EQ(GetStatus(), 0) << GetLog();
+        RunEngine();
+        EXPECT_EQ(GetStatus(), -1) << c.document;
+        EXPECT_EQ(logText(), std::string("Run Engine Error! \r\n") + c.text) << c.document;
+    }
+    // A good digit and a good list run.
+    for (const auto& document : {withBwpName("x FB2"), withCrs("1,6,")}) {
+        EXPECT_EQ(nrsynth_test::generate(nlohmann::json::parse(document), path), 0) << GetLog();
+    }
+}
+
+// A run holds its engine and tree: an InitEngine (and a new document) from another thread while
+// it runs replaces the globals without freeing what the run uses, and the run completes.
+TEST_F(PlainFunctions, InitEngineDuringARunLeavesTheRunItsEngine) {
+    auto document = waveform(3.84e6, 40, {cwCarrier(1000.0)});
+    document["AwgnEnabled"] = true;
+    StartDeserialize(document.dump().c_str());
+    InitEngine(path.c_str());
+    ASSERT_EQ(GetStatus(), 0) << GetLog();
+    std::atomic<bool> finished{false};
+    std::thread run([&finished] {
+        RunEngine();
+        finished = true;
+    });
+    while (!finished && (!std::filesystem::exists(path) || std::filesystem::file_size(path) == 0))
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    EXPECT_FALSE(finished) << "the run ended before the new engine came";
+    StartDeserialize(goodDocument.c_str());
+    InitEngine(folder.file("other.bin").c_str());
+    run.join();
+    EXPECT_EQ(std::filesystem::file_size(path), 40u * 38400 * 16);
+    // The new engine is the one that runs next.
+    RunEngine();
+    EXPECT_EQ(GetStatus(), 0) << GetLog();
+    EXPECT_EQ(std::filesystem::file_size(folder.file("other.bin")), 38400u * 16);
 }
 
 }  // namespace
