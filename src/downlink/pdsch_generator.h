@@ -92,7 +92,9 @@ class PDSCH_Generator {
                           OccupancyGrid& symbolFlags, bool firstChannel);
     /// The precoder of PRB `rb` for the current PRB bundle into PrecodingMatrix.
     void CalculatePrecodingMatrix(int rb);
-    /// Uplink codebooks of TS 38.211 clause 6.3.1.5 (Tables 6.3.1.5-1 to -7).
+    /// Uplink codebooks of TS 38.211 clause 6.3.1.5 (Tables 6.3.1.5-1 to -7), W of `ports` rows
+    /// and `layers` columns; transform precoding picks Table 6.3.1.5-2 over -3. A pair without
+    /// a table, or a TPMI outside it, fails naming the values.
     void GetPrecodingMatrix(bool transformPrecoded, int layers, int ports, int tpmi,
                             brinecomm::matrix<complex>& w);
 

@@ -1,9 +1,12 @@
 // Precoders: the PDSCH's own per-bundle matrix for 1, 2 and 4 ports, and the uplink codebooks
-// of TS 38.211 clause 6.3.1.5 for one and two antenna ports.
+// of TS 38.211 clause 6.3.1.5 (Tables 6.3.1.5-1 to -7) for the PUSCH.
 
 #include <cmath>
+#include <string>
 
+#include "common/failure.h"
 #include "downlink/pdsch_generator.h"
+#include "tables/uplink_codebook_tables.h"
 
 namespace Orvalis_NR {
 
@@ -39,31 +42,36 @@ void PDSCH_Generator::CalculatePrecodingMatrix(int rb) {
     // Other port counts keep the matrix they have.
 }
 
-void PDSCH_Generator::GetPrecodingMatrix(bool, int layers, int ports, int tpmi, brinecomm::matrix<complex>& w) {
-    const complex j(0.0, 1.0);
-    const double a = 0.7071067811865476;
+void PDSCH_Generator::GetPrecodingMatrix(bool transformPrecoded, int layers, int ports, int tpmi,
+                                         brinecomm::matrix<complex>& w) {
     if (layers == 1 && ports == 1) {
         w.resize(1, 1);
         w(0, 0) = 1.0;
-    } else if (layers == 1 && ports == 2 && tpmi >= 0 && tpmi <= 5) {
-        // TS 38.211 Table 6.3.1.5-1.
-        const complex second[6] = {0.0, 1.0, 1.0, -1.0, j, -j};
-        w.resize(2, 1);
-        w(0, 0) = tpmi == 1 ? 0.0 : a;
-        w(1, 0) = second[tpmi] * a;
-    } else if (layers == 2 && ports == 2 && tpmi >= 0 && tpmi <= 2) {
-        // TS 38.211 Table 6.3.1.5-4.
-        w.resize(2, 2);
-        if (tpmi == 0) {
-            w(0, 0) = a;
-            w(1, 1) = a;
-        } else {
-            w(0, 0) = 0.5;
-            w(0, 1) = 0.5;
-            w(1, 0) = tpmi == 1 ? complex(0.5) : 0.5 * j;
-            w(1, 1) = tpmi == 1 ? complex(-0.5) : -0.5 * j;
-        }
+        return;
     }
+    // Transform precoding only tells Tables 6.3.1.5-2 and -3 apart; multi-layer transmission is
+    // without it, so every other (layers, ports) pair has one table whatever the flag says.
+    const tables::UplinkCodebook* codebook = nullptr;
+    for (const auto& candidate : tables::kUplinkCodebooks) {
+        if (candidate.layers != layers || candidate.ports != ports) continue;
+        if (codebook == nullptr || candidate.transformPrecoding == (transformPrecoded ? 1 : 0))
+            codebook = &candidate;
+    }
+    if (codebook == nullptr)
+        failWith("Precoding: TS 38.211 clause 6.3.1.5 has no codebook for these layers and ports:",
+                 "NumberOfLayers " + std::to_string(layers) + ", NumberOfAntennaPorts " +
+                     std::to_string(ports));
+    if (tpmi < 0 || tpmi >= codebook->count)
+        failWith("Precoding: TPMI outside the codebook:",
+                 "TPMIIndex " + std::to_string(tpmi) + " (" + codebook->table + " holds 0.." +
+                     std::to_string(codebook->count - 1) + ")");
+    const tables::UplinkPrecoder& precoder = codebook->matrices[tpmi];
+    w.resize(ports, layers);
+    for (int row = 0; row < ports; ++row)
+        for (int column = 0; column < layers; ++column) {
+            const auto& unit = precoder.units[static_cast<std::size_t>(row * layers + column)];
+            w(row, column) = complex(unit[0], unit[1]) * precoder.scale;
+        }
 }
 
 }  // namespace Orvalis_NR
