@@ -14,6 +14,20 @@ using Models::Nr5g::NR5GWaveformSettings;
 using Models::Nr5g::Numerology;
 using Orvalis_NR::ComputeWaveformLength;
 
+// Gives `settings` one carrier of `numerology` and the given length settings.
+void setLength(NR5GWaveformSettings& settings, double sampleRate, int frames, int subframeOffset, int subframes,
+               int slotOffset, int slotCount, Numerology numerology = Numerology::SCS15k) {
+    settings.SampleRateAuto->setValue(sampleRate);
+    settings.NumberOfFrames->setValue(frames);
+    settings.SubframeOffset->setValue(subframeOffset);
+    settings.NumberOfSubframes->setValue(subframes);
+    settings.SlotOffsetInSubframe->setValue(slotOffset);
+    settings.NumberOfSlotsInSubframe->setValue(slotCount);
+    auto carriers = settings.NRCarriers->getValue();
+    carriers->resize(1);
+    carriers->getItem(0)->Numerology->setValue(numerology);
+}
+
 struct LengthCase {
     const char* name;
     double sampleRate;
@@ -28,15 +42,8 @@ class WaveformLength : public ::testing::TestWithParam<LengthCase> {};
 TEST_P(WaveformLength, FollowsFramesSubframesAndSlots) {
     const auto& c = GetParam();
     NR5GWaveformSettings settings;
-    settings.SampleRateAuto->setValue(c.sampleRate);
-    settings.NumberOfFrames->setValue(c.frames);
-    settings.SubframeOffset->setValue(c.subframeOffset);
-    settings.NumberOfSubframes->setValue(c.subframes);
-    settings.SlotOffsetInSubframe->setValue(c.slotOffset);
-    settings.NumberOfSlotsInSubframe->setValue(c.slotCount);
-    auto carriers = settings.NRCarriers->getValue();
-    carriers->resize(1);
-    carriers->getItem(0)->Numerology->setValue(c.numerology);
+    setLength(settings, c.sampleRate, c.frames, c.subframeOffset, c.subframes, c.slotOffset, c.slotCount,
+              c.numerology);
 
     const auto length = ComputeWaveformLength(settings);
     EXPECT_EQ(length.totalSamples, c.expectedTotal);
@@ -88,13 +95,7 @@ class RefusedWaveformLength : public ::testing::TestWithParam<RefusedCase> {};
 TEST_P(RefusedWaveformLength, NamesTheSettings) {
     const auto& c = GetParam();
     NR5GWaveformSettings settings;
-    settings.SampleRateAuto->setValue(c.sampleRate);
-    settings.NumberOfFrames->setValue(c.frames);
-    settings.SubframeOffset->setValue(c.subframeOffset);
-    settings.NumberOfSubframes->setValue(c.subframes);
-    settings.SlotOffsetInSubframe->setValue(c.slotOffset);
-    settings.NumberOfSlotsInSubframe->setValue(c.slotCount);
-    settings.NRCarriers->getValue()->resize(1);
+    setLength(settings, c.sampleRate, c.frames, c.subframeOffset, c.subframes, c.slotOffset, c.slotCount);
     try {
         ComputeWaveformLength(settings);
         ADD_FAILURE() << "no failure";

@@ -3,15 +3,12 @@
 
 #include <gtest/gtest.h>
 
-#include <atomic>
-#include <chrono>
 #include <cmath>
 #include <complex>
 #include <cstdlib>
 #include <filesystem>
 #include <numbers>
 #include <random>
-#include <thread>
 #include <vector>
 
 #include "dsp/sinc_low_pass.h"
@@ -183,14 +180,8 @@ TEST_F(WaveformOutput, CancelFromAnotherThreadRemovesTheOutput) {
     StartDeserialize(document.dump().c_str());
     InitEngine(path.c_str());
     ASSERT_EQ(GetStatus(), 0) << GetLog();
-    std::atomic<bool> finished{false};
-    std::thread run([&finished] {
-        RunEngine();
-        finished = true;
-    });
-    while (!finished && (!std::filesystem::exists(path) || std::filesystem::file_size(path) == 0))
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    EXPECT_FALSE(finished) << "the run ended before the cancel came";
+    nrsynth_test::BackgroundRun run(path);
+    EXPECT_FALSE(run.finished()) << "the run ended before the cancel came";
     Cancel();
     run.join();
     EXPECT_EQ(GetStatus(), 0);

@@ -3,7 +3,11 @@
 
 #include <nlohmann/json.hpp>
 
+#include <atomic>
+#include <chrono>
+#include <filesystem>
 #include <string>
+#include <thread>
 
 #include "nrsynth/nrsynth.h"
 
@@ -28,5 +32,32 @@ inline int generate(const nlohmann::json& document, const std::string& outputPat
     RunEngine();
     return GetStatus();
 }
+
+/// A long run started on its own thread (the document already deserialized and the engine
+/// initialised for `outputPath`); the constructor returns once the first bytes are on disk or the
+/// run has ended. The destructor joins the thread.
+class BackgroundRun {
+  public:
+    explicit BackgroundRun(const std::string& outputPath)
+        : thread_([this] {
+              RunEngine();
+              finished_ = true;
+          }) {
+        while (!finished_ && (!std::filesystem::exists(outputPath) || std::filesystem::file_size(outputPath) == 0))
+            std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    ~BackgroundRun() { join(); }
+    BackgroundRun(const BackgroundRun&) = delete;
+    BackgroundRun& operator=(const BackgroundRun&) = delete;
+
+    bool finished() const { return finished_; }
+    void join() {
+        if (thread_.joinable()) thread_.join();
+    }
+
+  private:
+    std::atomic<bool> finished_{false};
+    std::thread thread_;
+};
 
 }  // namespace nrsynth_test

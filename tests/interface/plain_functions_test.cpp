@@ -2,13 +2,10 @@
 
 #include <gtest/gtest.h>
 
-#include <atomic>
-#include <chrono>
 #include <cstring>
 #include <filesystem>
 #include <memory>
 #include <string>
-#include <thread>
 
 #include "../engine/output_files.h"
 #include "../engine/waveform_test_support.h"
@@ -245,14 +242,8 @@ TEST_F(PlainFunctions, InitEngineDuringARunLeavesTheRunItsEngine) {
     StartDeserialize(document.dump().c_str());
     InitEngine(path.c_str());
     ASSERT_EQ(GetStatus(), 0) << GetLog();
-    std::atomic<bool> finished{false};
-    std::thread run([&finished] {
-        RunEngine();
-        finished = true;
-    });
-    while (!finished && (!std::filesystem::exists(path) || std::filesystem::file_size(path) == 0))
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    EXPECT_FALSE(finished) << "the run ended before the new engine came";
+    nrsynth_test::BackgroundRun run(path);
+    EXPECT_FALSE(run.finished()) << "the run ended before the new engine came";
     StartDeserialize(goodDocument.c_str());
     InitEngine(folder.file("other.bin").c_str());
     run.join();
