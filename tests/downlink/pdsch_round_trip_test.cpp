@@ -80,24 +80,6 @@ Bits payload(long long from, int count) {
     return bits;
 }
 
-/// Segmentation of TS 38.212 clause 5.2.2 with the graph choice of clause 7.2.2.
-struct Segmentation {
-    int graph, blocks, kPrime, z, crcPerBlock;
-    Segmentation(int a, double rate) {
-        const int b = a + (a > 3824 ? 24 : 16);
-        graph = (a <= 292 || (a <= 3824 && rate <= 0.67) || rate <= 0.25) ? 2 : 1;
-        const int kcb = graph == 1 ? 8448 : 3840;
-        blocks = b <= kcb ? 1 : (b + kcb - 24 - 1) / (kcb - 24);
-        crcPerBlock = blocks > 1 ? 24 : 0;
-        kPrime = (b + blocks * crcPerBlock) / blocks;
-        const int kb = graph == 1 ? 22 : b > 640 ? 10 : b > 560 ? 9 : b > 192 ? 8 : 6;
-        z = 1 << 30;
-        for (int a0 : {2, 3, 5, 7, 9, 11, 13, 15})
-            for (int v = a0; v <= 384; v *= 2)
-                if (v * kb >= kPrime) z = std::min(z, v);
-    }
-};
-
 class PdschRoundTrip : public ::testing::TestWithParam<Case> {};
 
 TEST_P(PdschRoundTrip, ReceiverRecoversEveryCodeBlockAndReferenceSignal) {
