@@ -208,6 +208,23 @@ class PDSCH_Generator {
     bool readSlot(int entry, int frame, SlotPlace& place) const;
     const std::vector<complex>* portLayer(int position) const;
 
+    /// An LTE carrier whose CRS the data avoids: fixed part from Init, the rest set per slot
+    /// and symbol by the rate-matching count.
+    struct LteCrsItem {
+        int centre = 0, low = 0, high = 0, ports = 1, vShift = 0;
+        std::vector<int> mbsfnSubframes;
+        bool mbsfn = false, hasCrs = false;
+        int step = 6, shift = 0, adjust = 0;
+    };
+    void buildLteCrs(Models::Nr5g::NRCarrier* carrier);
+    void reserveSlotStorage();
+
+    std::vector<LteCrsItem> lteCrs_;
+    std::vector<int> dmrsPortNumbers_;                 ///< Ports plus 1000
+    std::vector<int> ptrsPortNumber_{1000};
+    std::vector<int> ptrsCInit_ = std::vector<int>(1);
+    std::vector<std::vector<complex>> ptrsValues_;     ///< the PT-RS base sequence being made
+    BitSequence dmrsGold_;                             ///< Gold bits of one DM-RS sequence
     std::vector<int> symbolHits_;
     int rmCoresetStart_ = 0;          ///< first RB of the rate-matched CORESET in the BWP
     std::string rmCoresetBitmap_;     ///< its FrequencyDomainBitmap

@@ -6,7 +6,6 @@
 
 #include "downlink/pbch_generator.h"
 #include "downlink/pdsch_generator.h"
-#include "downlink/pdsch_list.h"
 
 namespace Orvalis_NR {
 
@@ -59,32 +58,8 @@ void PDSCH_Generator::CalculateRateMathingParameters(int frame, int subframe, in
     const bool slotHit = absoluteSlot <= INT32_MAX && contains(RmCoresetSlots, static_cast<int>(absoluteSlot));
 
     // LTE carriers whose CRS the data avoids (TS 38.214 clause 5.1.4.2, lte-CRS-ToMatchAround).
-    auto coexistence = Carrier->Downlink->getValue()->LTECoexistence->getValue();
-    const bool lteOn = coexistence->Enabled->getValue() && NumerologyValue == 0;
-    struct Lte {
-        int centre, low, high, step, shift, adjust;
-        bool mbsfn, hasCrs;
-        int ports, vShift;
-    };
-    thread_local std::vector<Lte> lte;
-    lte.clear();
-    if (lteOn) {
-        auto items = coexistence->LTECRS->getValue();
-        static constexpr int kRb[6] = {6, 15, 25, 50, 75, 100};
-        for (int i = 0; i < items->getCount(); ++i) {
-            auto crs = items->getItem(i);
-            const int bw = static_cast<int>(crs->LTEBandwidth->getValue());
-            const int nrb = bw >= 1 && bw <= 5 ? kRb[bw] : 6;
-            Lte item{};
-            item.mbsfn = contains(parseIntList(crs->MBSFNSubframeIndexArrayStr->getValue()), subframe);
-            item.centre = crs->OffsetToPointA->getValue();
-            item.low = item.centre - 6 * nrb;
-            item.high = item.centre + 1 + 6 * nrb;
-            item.ports = crs->NumberOfCRSAntennaPorts->getValue();
-            item.vShift = crs->VShift->getValue();
-            lte.push_back(item);
-        }
-    }
+    auto& lte = lteCrs_;
+    for (auto& item : lte) item.mbsfn = contains(item.mbsfnSubframes, subframe);
 
     long long t = 0, crsSum = 0, ptrsSum = 0, csiSum = 0, dmrsSum = 0;
     for (int s : DataSymbols) {

@@ -7,8 +7,8 @@
 #include "coding/gold_sequence.h"
 #include "common/failure.h"
 #include "downlink/pdsch_coreset_view.h"
+#include "common/list_text.h"
 #include "downlink/pdsch_generator.h"
-#include "downlink/pdsch_list.h"
 #include "tables/pdsch_tables.h"
 
 namespace Orvalis_NR {
@@ -30,9 +30,12 @@ bool GetLBar_PDSCH_DMRS(std::vector<int>& lBar, PDSCH_MappingTypeEnumList type, 
     return true;
 }
 
-bool Generate_PDSCH_DMRS_Signal(std::vector<std::vector<complex>>& dmrs, CP_TypeEnumList, std::vector<int> ports,
-                                int firstRb, int rbCount, int configType, int dmrsSymbol, int, int,
-                                std::vector<int> cInit) {
+namespace {
+
+/// The DM-RS values of Generate_PDSCH_DMRS_Signal, with the Gold bits in `c`: the generator's
+/// slot path calls this with its own storage, so that nothing is allocated per slot.
+bool fillPdschDmrs(std::vector<std::vector<complex>>& dmrs, const std::vector<int>& ports, int firstRb, int rbCount,
+                   int configType, int dmrsSymbol, const std::vector<int>& cInit, BitSequence& c) {
     if (firstRb < 0 || rbCount < 1 || firstRb > 4096 || rbCount > 4096) return false;
     if (configType != 1 && configType != 2) return false;
     if (dmrsSymbol < 0 || dmrsSymbol > 2 || cInit.size() < ports.size()) return false;
@@ -43,7 +46,6 @@ bool Generate_PDSCH_DMRS_Signal(std::vector<std::vector<complex>>& dmrs, CP_Type
     dmrs.resize(ports.size());
     const int values = perRb * rbCount;
     const int offset = 2 * perRb * firstRb;  // the sequence runs from common RB 0
-    thread_local BitSequence c;
     c.resize(static_cast<std::size_t>(2 * values));
     constexpr double a = 0.7071067811865476;
     for (std::size_t i = 0; i < ports.size(); ++i) {
@@ -62,6 +64,15 @@ bool Generate_PDSCH_DMRS_Signal(std::vector<std::vector<complex>>& dmrs, CP_Type
         }
     }
     return true;
+}
+
+}  // namespace
+
+bool Generate_PDSCH_DMRS_Signal(std::vector<std::vector<complex>>& dmrs, CP_TypeEnumList, std::vector<int> ports,
+                                int firstRb, int rbCount, int configType, int dmrsSymbol, int, int,
+                                std::vector<int> cInit) {
+    BitSequence c;
+    return fillPdschDmrs(dmrs, ports, firstRb, rbCount, configType, dmrsSymbol, cInit, c);
 }
 
 void PDSCH_Generator::buildDmrsSymbols(NRCarrier* carrier) {
@@ -123,7 +134,7 @@ void PDSCH_Generator::buildDmrsSymbols(NRCarrier* carrier) {
         auto items = coexistence->LTECRS->getValue();
         for (int i = 0; i < items->getCount(); ++i) {
             auto crs = items->getItem(i);
-            const auto mbsfn = parseIntList(crs->MBSFNSubframeIndexArrayStr->getValue());
+            const auto mbsfn = intsFromCommaList(crs->MBSFNSubframeIndexArrayStr->getValue());
             bool allMbsfn = !SlotList.empty();
             for (int s : SlotList)
                 if (std::find(mbsfn.begin(), mbsfn.end(), s % 10) == mbsfn.end()) allMbsfn = false;
@@ -219,7 +230,7 @@ void PDSCH_Generator::buildPtrs() {
         }
     }
 
-    PtrsPortList = parseIntList(Settings->getPTRSports());
+    PtrsPortList = intsFromCommaList(Settings->getPTRSports());
     for (int p : PtrsPortList)
         if (p < 0 || p > 11) failWith("PTRSports names a port out of range.", who + "PTRSports \"" + Settings->getPTRSports() + "\"");
     int nrb = 0;
@@ -251,12 +262,9 @@ void PDSCH_Generator::buildPtrs() {
 void PDSCH_Generator::generateDmrs(int subframe, int slot) {
     const int t = subframe * SlotsPerSubframe + slot;
     const int span = HighestPrb - LowestPrb + 1;
-    thread_local std::vector<int> cInit;
-    thread_local std::vector<int> ports;
     for (std::size_t d = 0; d < DmrsSymbols.size(); ++d) {
         const int s = DmrsSymbols[d];
-        cInit.resize(Ports.size());
-        ports.resize(Ports.size());
+        auto& cInit = DmrsCInit[d];
         for (std::size_t i = 0; i < Ports.size(); ++i) {
             const int p = Ports[i];
             int n = NScid;
@@ -268,18 +276,14 @@ void PDSCH_Generator::generateDmrs(int subframe, int slot) {
             }
             const long long value = ((static_cast<long long>(SymbolsPerSlot) * t + 1 + s) * (2LL * id + 1) << 17) + 2LL * id + n;
             cInit[i] = static_cast<int>(value & 0x7FFFFFFF);
-            ports[i] = p + 1000;
         }
-        DmrsCInit[d] = cInit;
         const int code = DoubleSymbolDmrs ? 1 + DmrsSymbolOffsets[d] : 0;
-        Generate_PDSCH_DMRS_Signal(DmrsValues[d], CP_Normal, ports, LowestPrb + BwpStart, span, DmrsConfigType, code,
-                                   NScid, t, cInit);
+        fillPdschDmrs(DmrsValues[d], dmrsPortNumbers_, LowestPrb + BwpStart, span, DmrsConfigType, code, cInit, dmrsGold_);
     }
     if (PtrsOn && !DmrsSymbols.empty()) {
-        thread_local std::vector<std::vector<complex>> base;
-        Generate_PDSCH_DMRS_Signal(base, CP_Normal, {1000}, LowestPrb + BwpStart, span, DmrsConfigType, 0, NScid, t,
-                                   {DmrsCInit[0][0]});
-        PtrsBase = base[0];
+        ptrsCInit_[0] = DmrsCInit[0][0];
+        fillPdschDmrs(ptrsValues_, ptrsPortNumber_, LowestPrb + BwpStart, span, DmrsConfigType, 0, ptrsCInit_, dmrsGold_);
+        PtrsBase.assign(ptrsValues_[0].begin(), ptrsValues_[0].end());
     }
 }
 

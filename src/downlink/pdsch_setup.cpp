@@ -10,8 +10,8 @@
 #include "coding/ldpc_segmentation.h"
 #include "coding/transport_block_size.h"
 #include "common/failure.h"
+#include "common/list_text.h"
 #include "downlink/pdsch_generator.h"
-#include "downlink/pdsch_list.h"
 
 namespace Orvalis_NR {
 
@@ -125,7 +125,7 @@ bool PDSCH_Generator::Init(NRCarrier* carrier, NRDLSCH* settings, NRDLBWP* bwp, 
     buildAllocation();
     buildVrbToPrb();
 
-    SlotList = parseIntList(settings->SlotIndexArrayStr->getValue());
+    SlotList = intsFromCommaList(settings->SlotIndexArrayStr->getValue());
     const int first = settings->FirstSymbol->getValue();
     const int last = settings->LastSymbol->getValue();
     if (first < 0 || first >= SymbolsPerSlot) failWith("PDSCH FirstSymbol out of range.", named(settings, "FirstSymbol", first));
@@ -147,6 +147,12 @@ bool PDSCH_Generator::Init(NRCarrier* carrier, NRDLSCH* settings, NRDLBWP* bwp, 
     PrecodingMatrix.resize(static_cast<int>(Ports.size()), static_cast<int>(Ports.size()));
     for (int i = 0; i < PrecodingMatrix.rows(); ++i) PrecodingMatrix(i, i) = 1.0;
 
+    buildLteCrs(carrier);
+    reserveSlotStorage();
+    return true;
+}
+
+void PDSCH_Generator::reserveSlotStorage() {
     // Per-slot storage at its largest, so that the slot path does not allocate.
     const std::size_t maxRe = static_cast<std::size_t>(AllocRbCount) * 12 * DataSymbols.size();
     for (auto& cw : CodeWords) {
@@ -154,13 +160,46 @@ bool PDSCH_Generator::Init(NRCarrier* carrier, NRDLSCH* settings, NRDLBWP* bwp, 
         cw.CodedBits.reserve(maxBits);
         cw.ScrambledBits.reserve(maxBits);
         cw.PnBits.reserve(maxBits);
+        cw.RateMatched.reserve(maxBits);
+        cw.Interleaved.reserve(maxBits);
+        cw.EncoderIn.reserve(static_cast<std::size_t>(cw.K));
         cw.Layers.reserve(8);
         for (auto& layer : cw.Layers) layer.reserve(maxRe);
     }
+    // DM-RS and PT-RS sequences span at most the bandwidth part.
+    const std::size_t maxValues = static_cast<std::size_t>(DmrsConfigType == 1 ? 6 : 4) * static_cast<std::size_t>(BwpSize);
     DmrsValues.assign(DmrsSymbols.size(), std::vector<std::vector<complex>>(Ports.size()));
+    for (auto& symbol : DmrsValues)
+        for (auto& port : symbol) port.reserve(maxValues);
     DmrsCInit.assign(DmrsSymbols.size(), std::vector<int>(Ports.size()));
+    dmrsPortNumbers_.clear();
+    for (int p : Ports) dmrsPortNumbers_.push_back(p + 1000);
+    ptrsValues_.assign(1, {});
+    ptrsValues_[0].reserve(maxValues);
+    PtrsBase.reserve(maxValues);
+    dmrsGold_.reserve(2 * maxValues);
     symbolHits_.assign(static_cast<std::size_t>(SymbolsPerSlot), 0);
-    return true;
+}
+
+void PDSCH_Generator::buildLteCrs(NRCarrier* carrier) {
+    lteCrs_.clear();
+    auto coexistence = carrier->Downlink->getValue()->LTECoexistence->getValue();
+    if (!coexistence->Enabled->getValue() || NumerologyValue != 0) return;
+    auto items = coexistence->LTECRS->getValue();
+    static constexpr int kRb[6] = {6, 15, 25, 50, 75, 100};
+    for (int i = 0; i < items->getCount(); ++i) {
+        auto crs = items->getItem(i);
+        const int bw = static_cast<int>(crs->LTEBandwidth->getValue());
+        const int nrb = bw >= 1 && bw <= 5 ? kRb[bw] : 6;
+        LteCrsItem item;
+        item.mbsfnSubframes = intsFromCommaList(crs->MBSFNSubframeIndexArrayStr->getValue());
+        item.centre = crs->OffsetToPointA->getValue();
+        item.low = item.centre - 6 * nrb;
+        item.high = item.centre + 1 + 6 * nrb;
+        item.ports = crs->NumberOfCRSAntennaPorts->getValue();
+        item.vShift = crs->VShift->getValue();
+        lteCrs_.push_back(std::move(item));
+    }
 }
 
 void PDSCH_Generator::readIdentities(NRCarrier* carrier) {
@@ -179,8 +218,8 @@ void PDSCH_Generator::readIdentities(NRCarrier* carrier) {
 void PDSCH_Generator::readPorts() {
     DmrsConfigType = Settings->DMRSConfigurationType->getValue() != DMRSConfigurationType::Type1 ? 2 : 1;
     DoubleSymbolDmrs = Settings->DMRSDuration->getValue() == DMRSDuration::DoubleSymbol;
-    Ports = parseIntList(Settings->DMRSports->getValue());
-    PortArray = parseIntList(Settings->AntennaPortArray->getValue());
+    Ports = intsFromCommaList(Settings->DMRSports->getValue());
+    PortArray = intsFromCommaList(Settings->AntennaPortArray->getValue());
     NumberOfLayers = Settings->NumberOfLayers->getValue();
     NumberOfCodewords = Settings->NumberOfCodewords->getValue();
     CdmGroups = Settings->NumberOfDMRSCDMGroup->getValue();
@@ -442,7 +481,7 @@ void PDSCH_Generator::buildCoresetRateMatching(NRCarrier* carrier) {
     for (int i = 0; i < dcis->getCount(); ++i) {
         auto dci = dcis->getItem(i);
         if (dci->CoresetIndex->getValue() != index) continue;
-        for (int s : parseIntList(dci->SlotIndexArrayStr->getValue())) RmCoresetSlots.push_back(s);
+        for (int s : intsFromCommaList(dci->SlotIndexArrayStr->getValue())) RmCoresetSlots.push_back(s);
         for (int k = 0; k < symbols; ++k) RmCoresetSymbols.push_back(dci->FirstSymbol->getValue() + k);
     }
 }
