@@ -228,7 +228,32 @@ class PDSCH_Generator {
     std::vector<int> symbolHits_;
     int rmCoresetStart_ = 0;          ///< first RB of the rate-matched CORESET in the BWP
     std::string rmCoresetBitmap_;     ///< its FrequencyDomainBitmap
-    std::vector<std::size_t> layerPositionsRows_;  ///< store rows of MapWithPrecoding
+    /// A store row that carries one of this channel's ports, and where its layer is read.
+    struct MappedRow {
+        std::size_t store = 0;
+        int position = 0;  ///< place of the port in Ports
+        int port = 0;      ///< port number less 1000
+        int groupOffset = 0;
+        std::size_t read = 0;
+    };
+    /// One resource element of the walk.
+    struct ElementPlace {
+        std::size_t at = 0;  ///< index in a store row
+        int re = 0;          ///< subcarrier in the RB
+        int prb = 0;
+        int dmrsIndex = -1;  ///< entry of DmrsValues in a DM-RS symbol
+        bool isDmrs = false, isData = false, ptrsRb = false;
+    };
+    /// The one walk of Map and MapWithPrecoding over slots, symbols, RBs and REs; the two differ
+    /// only in how layer and DM-RS values become the value of an antenna row.
+    void walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, int frame, OccupancyGrid& symbolFlags,
+                        bool firstChannel, bool precoded);
+    void mapElement(const ElementPlace& e, SlotGrid& grid, OccupancyGrid& occupancy, bool precoded);
+    bool dmrsPortValue(const ElementPlace& e, std::size_t r, bool precoded, complex& value) const;
+    bool dataPortValue(std::size_t r, bool precoded, complex& value);
+
+    std::vector<MappedRow> rows_;
+    std::size_t commonRead_ = 0;  ///< read position of all layers under precoding
     std::vector<const std::vector<complex>*> layers_;  ///< layer of each port position
 };
 
