@@ -197,7 +197,8 @@ TEST(UplinkCodebookStructure, OneLayerOnOnePortIsTheUnitWhateverTheTpmi) {
 }
 
 TEST(UplinkCodebookStructure, PairsWithoutATableFailNamingLayersAndPorts) {
-    for (auto [layers, ports] : {std::pair{3, 2}, std::pair{2, 1}, std::pair{1, 3}, std::pair{8, 8}}) {
+    for (const auto& pair : {std::pair{3, 2}, std::pair{2, 1}, std::pair{1, 3}, std::pair{8, 8}}) {
+        const int layers = pair.first, ports = pair.second;  // clang 14 cannot capture bindings
         const std::string text = nrsynth_test::failureText([&] { precoder(false, layers, ports, 0); });
         EXPECT_NE(text.find("NumberOfLayers " + std::to_string(layers) + ", NumberOfAntennaPorts " +
                             std::to_string(ports)),

@@ -47,7 +47,7 @@ inline std::vector<unsigned char> readMarkers(const std::string& path) {
 inline std::vector<std::complex<double>> readSamples(const std::string& path) {
     const std::vector<unsigned char> bytes = readMarkers(path);
     std::vector<std::complex<double>> samples(bytes.size() / sizeof(std::complex<double>));
-    std::memcpy(samples.data(), bytes.data(), samples.size() * sizeof(std::complex<double>));
+    if (!samples.empty()) std::memcpy(samples.data(), bytes.data(), samples.size() * sizeof(std::complex<double>));
     return samples;
 }
 

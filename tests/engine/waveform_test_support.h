@@ -19,7 +19,10 @@ inline nlohmann::json cwCarrier(double frequencyOffset = 0.0) {
 }
 
 /// A waveform at `sampleRate` with `frames` frames and the given carriers.
+/// A braced single carrier, `{cwCarrier()}`, arrives as that object under clang (the copy
+/// constructor wins over the list) and as a one-item array under g++: both mean one carrier.
 inline nlohmann::json waveform(double sampleRate, int frames, nlohmann::json carriers) {
+    if (carriers.is_object()) carriers = nlohmann::json::array({carriers});
     return {{"SampleRateAuto", sampleRate}, {"NumberOfFrames", frames}, {"NRCarriers", std::move(carriers)}};
 }
 
