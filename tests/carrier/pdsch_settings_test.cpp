@@ -34,6 +34,10 @@ const BadSetting kBad[] = {
     {"PtrsDensity", [](auto& d) { d["K_PTRS"] = 0; }, "K_PTRS 0"},
     {"RbgBitmapTooLong", [](auto& d) { d["RAType"] = "RAType0"; d["RBGBitmap"] = std::string(40, '1'); }, "RBGBitmap"},
     {"RntiOutOfRange", [](auto& d) { d["RNTI"] = 70000; }, "RNTI 70000"},
+    {"RbgBitmapNotBinary", [](auto& d) { d["RAType"] = "RAType0"; d["RBGBitmap"] = "1x01"; }, "RBGBitmap \"1x01\""},
+    {"MalformedAntennaPortArray", [](auto& d) { d["AntennaPortArray"] = "1000,,1001"; }, "invalid stoi argument"},
+    {"PortNumberBeyondInt", [](auto& d) { d["DMRSports"] = "0,99999999999"; }, "stoi argument out of range"},
+    {"MalformedPtrsPorts", [](auto& d) { d["PTRSEnabled"] = true; d["PTRSports"] = "0,a"; }, "invalid stoi argument"},
 };
 
 class PdschBadSettings : public ::testing::TestWithParam<BadSetting> {};
