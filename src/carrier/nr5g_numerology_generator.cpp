@@ -4,9 +4,11 @@
 #include <cmath>
 #include <string>
 
+#include "downlink/csi_rs_generator.h"
 #include "downlink/pbch_generator.h"
 #include "downlink/pdcch_generator.h"
 #include "downlink/pdsch_generator.h"
+#include "downlink/prs_generator.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
 #include "common/list_text.h"
@@ -45,6 +47,8 @@ NR5GNumerologyGenerator::~NR5GNumerologyGenerator() {
     for (auto* generator : pbchGenerators) delete generator;
     for (auto* generator : pdcchGenerators) delete generator;
     for (auto* generator : pdschGenerators) delete generator;
+    for (auto* generator : csiRsGenerators) delete generator;
+    for (auto* generator : prsGenerators) delete generator;
 }
 
 void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform, Models::Nr5g::NRCarrier& owner,
@@ -87,11 +91,16 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
     pdcchGenerators.clear();
     for (auto* generator : pdschGenerators) delete generator;
     pdschGenerators.clear();
+    for (auto* generator : csiRsGenerators) delete generator;
+    csiRsGenerators.clear();
+    for (auto* generator : prsGenerators) delete generator;
+    prsGenerators.clear();
     lowestSubcarrier = 360000;
     highestSubcarrier = 0;
     transformPrecoded = false;
     if (owner.CarrierType->getValue() == CarrierType::DL) {
         buildDownlinkChannels();
+        buildReferenceSignals();
         buildPdschChannels();
     }
     if (!hasValidChannel) return;
@@ -167,10 +176,54 @@ std::shared_ptr<Models::Nr5g::NRDLBWP> NR5GNumerologyGenerator::downlinkBwp(int 
     return bwp;
 }
 
+void NR5GNumerologyGenerator::buildReferenceSignals() {
+    auto downlink = carrier->Downlink->getValue();
+    Log("Start Init CSI-RS");
+    auto csiRsItems = downlink->CSIRS->getValue();
+    for (int i = 0; i < csiRsItems->getCount(); ++i) {
+        auto item = csiRsItems->getItem(i);
+        if (!item->Enabled->getValue()) continue;
+        auto bwp = downlinkBwp(item->BWPIndex->getValue(), "Downlink.CSIRS[" + std::to_string(i) + "]");
+        if (static_cast<int>(bwp->Numerology->getValue()) != numerology) continue;
+        auto* generator = new CSI_RS_Generator();
+        csiRsGenerators.push_back(generator);
+        generator->Init(settings, carrier, bwp.get(), item.get());
+        hasValidChannel = true;
+        if (generator->RbNumber <= 0) continue;
+        int low = 0, high = 0;
+        generator->GetScAllocation(low, high);
+        lowestSubcarrier = std::min(low, lowestSubcarrier);
+        highestSubcarrier = std::max(high, highestSubcarrier);
+    }
+    Log("End Init CSI-RS");
+
+    // A PRS names its spacing and prefix itself; 60 kHz is numerology 2 or, extended, 3.
+    Log("Start Init PRS");
+    auto prsItems = downlink->PRS->getValue();
+    for (int i = 0; i < prsItems->getCount(); ++i) {
+        auto item = prsItems->getItem(i);
+        if (!item->Enabled->getValue()) continue;
+        const int scs = static_cast<int>(item->SubcarrierSpacing->getValue());
+        const bool extended = item->CyclicPrefix->getValue() == Models::Nr5g::CyclicPrefixType::Extended;
+        if (scs != mu || extended != extendedCp) continue;
+        auto* generator = new PRS_Generator();
+        prsGenerators.push_back(generator);
+        generator->Init(carrier, item.get(), fftSize, pbchGenerators);
+        hasValidChannel = true;
+        if (generator->Bandwidth <= 0) continue;
+        int low = 0, high = 0;
+        generator->GetScAllocation(low, high);
+        lowestSubcarrier = std::min(low, lowestSubcarrier);
+        highestSubcarrier = std::max(high, highestSubcarrier);
+    }
+    Log("End Init PRS");
+}
+
 void NR5GNumerologyGenerator::buildPdschChannels() {
     auto downlink = carrier->Downlink->getValue();
     auto items = downlink->DLSCH->getValue();
-    std::vector<PRS_Generator*> prs;
+    std::vector<const CsiRsFootprint*> footprints;
+    for (const auto* csiRs : csiRsGenerators) footprints.push_back(&csiRs->Footprint);
     Log("Start Init PDSCH");
     for (int i = 0; i < items->getCount(); ++i) {
         auto item = items->getItem(i);
@@ -179,7 +232,8 @@ void NR5GNumerologyGenerator::buildPdschChannels() {
         if (static_cast<int>(bwp->Numerology->getValue()) != numerology) continue;
         auto* generator = new PDSCH_Generator();
         pdschGenerators.push_back(generator);
-        generator->Init(carrier, item.get(), bwp.get(), fftSize, pbchGenerators, pdcchGenerators, prs);
+        generator->Init(carrier, item.get(), bwp.get(), fftSize, pbchGenerators, pdcchGenerators, prsGenerators,
+                        footprints);
         hasValidChannel = true;
         int smallest = -1, largest = -1;
         for (int n = 0; n < static_cast<int>(generator->RbMask.size()); ++n)
@@ -241,6 +295,8 @@ std::vector<int> NR5GNumerologyGenerator::countChannels() const {
         if (!generator->ReserveOnly) ++counts[static_cast<std::size_t>(channelOrder[PlacePBCH])];
     counts[static_cast<std::size_t>(channelOrder[PlacePDCCH])] += static_cast<int>(pdcchGenerators.size());
     counts[static_cast<std::size_t>(channelOrder[PlacePDSCH])] += static_cast<int>(pdschGenerators.size());
+    counts[static_cast<std::size_t>(channelOrder[PlaceCSIRS])] += static_cast<int>(csiRsGenerators.size());
+    counts[static_cast<std::size_t>(channelOrder[PlacePRS])] += static_cast<int>(prsGenerators.size());
     return counts;
 }
 
@@ -304,6 +360,36 @@ void NR5GNumerologyGenerator::ResetDataSource() {
     for (auto* generator : pdschGenerators)
         for (auto& codeWord : generator->CodeWords)
             if (codeWord.Source) codeWord.Source->Reset();
+}
+
+bool NR5GNumerologyGenerator::mapCsiRs(int frame, bool puncture, bool& anyMapped) {
+    if (csiRsGenerators.empty()) return true;
+    // The two halves of the list log alike; the texts are kept as they have always been.
+    Log(puncture ? "Start Generate CSI-RS [PunctureMode]" : "Start Generate CSI-RS [RateMatchMode]");
+    const bool markAlc = isPrimary && pdschGenerators.empty() && pbchGenerators.empty();
+    for (auto* generator : csiRsGenerators) {
+        if (generator->Settings->REUsedForPDSCH->getValue() != puncture) continue;
+        if (static_cast<int>(generator->GetNumerology()) != numerology) continue;
+        generator->GenerateAndMap(grid, occupancy, frame, symbolMarks, markAlc);
+        anyMapped = true;
+        if (takeCancel()) return false;
+    }
+    Log(puncture ? "Start Generate CSI-RS [PunctureMode]" : "End Generate CSI-RS [RateMatchMode]");
+    return !takeCancel();
+}
+
+bool NR5GNumerologyGenerator::mapPrs(int frame, bool& anyMapped) {
+    if (prsGenerators.empty()) return true;
+    Log("Start Generate PRS");
+    const bool markAlc = isPrimary && pdschGenerators.empty() && pbchGenerators.empty() && csiRsGenerators.empty();
+    for (auto* generator : prsGenerators) {
+        if (generator->GetNumerology() != numerology) continue;
+        generator->Map(grid, occupancy, frame, symbolMarks, markAlc);
+        anyMapped = true;
+        if (takeCancel()) return false;
+    }
+    Log("End Generate CSI-RS [RateMatchMode]");
+    return !takeCancel();
 }
 
 bool NR5GNumerologyGenerator::takeCancel() { return cancelRequested.exchange(0, std::memory_order_relaxed) != 0; }
@@ -389,6 +475,9 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     if (!pdcchGenerators.empty()) Log("End Generate PDCCH");
     if (takeCancel()) return;
 
+    if (!mapCsiRs(frame, false, anyMapped)) return;
+    if (!mapPrs(frame, anyMapped)) return;
+
     if (!pdschGenerators.empty()) Log("Start Generate PDSCH");
     for (std::size_t i = 0; i < pdschGenerators.size(); ++i) {
         auto* generator = pdschGenerators[i];
@@ -399,6 +488,7 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     }
     if (!pdschGenerators.empty()) Log("End Generate PDSCH");
     if (takeCancel()) return;
+    if (!mapCsiRs(frame, true, anyMapped)) return;
     if (!anyMapped) return;
 
     Log("Start OFDM");

@@ -16,9 +16,11 @@
 
 namespace Orvalis_NR {
 
+class CSI_RS_Generator;
 class PBCH_Generator;
 class PDCCH_Generator;
 class PDSCH_Generator;
+class PRS_Generator;
 
 /// Places of the channel kinds in a count vector.
 enum ChannelPlace { PlacePBCH, PlacePDSCH, PlacePDCCH, PlaceCSIRS, PlacePUSCH, PlacePUCCH, PlaceSRS, PlacePRS };
@@ -70,6 +72,8 @@ public:
     std::vector<PBCH_Generator*> pbchGenerators;
     std::vector<PDCCH_Generator*> pdcchGenerators;
     std::vector<PDSCH_Generator*> pdschGenerators;
+    std::vector<CSI_RS_Generator*> csiRsGenerators;
+    std::vector<PRS_Generator*> prsGenerators;
     std::vector<std::shared_ptr<Filter>> filters;
     int sampleDelay = 0;
     std::atomic<char> cancelRequested{0};
@@ -80,7 +84,11 @@ private:
     void buildDownlinkChannels();
     /// Element `index` of Downlink.BWP; fails naming `item` when there is none.
     std::shared_ptr<Models::Nr5g::NRDLBWP> downlinkBwp(int index, const std::string& item) const;
+    void buildReferenceSignals();
     void buildPdschChannels();
+    /// Runs the CSI-RS generators that puncture the data (true) or that it rate-matches around.
+    bool mapCsiRs(int frame, bool puncture, bool& anyMapped);
+    bool mapPrs(int frame, bool& anyMapped);
     void designFilter();
     int filterGuard() const;
     bool takeCancel();

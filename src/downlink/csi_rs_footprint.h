@@ -16,7 +16,7 @@ struct CsiRsFootprint {
     int RbCount = 0;         ///< RBs of the resource
     int PrbStep = 1;         ///< 2 for density 0.5, else 1
     int OddPrbs = 0;         ///< n mod PrbStep of the RBs that carry it
-    std::vector<int> SlotList;    ///< slot numbers within the frame
+    std::vector<int> SlotList;    ///< the resource's slot list, absolute slot numbers
     std::vector<int> CsiSymbols;  ///< symbols within the slot
     std::array<int, 12> ReWeights{};  ///< 1 for each subcarrier of an RB it takes
 };
