@@ -95,9 +95,11 @@ bool PRS_Generator::Init(Models::Nr5g::NRCarrier* carrier, Models::Nr5g::NRPRS* 
         failWith("The PRS resource blocks are out of range.",
                  path_ + " StartPRB " + std::to_string(StartPrb) + ", ResourceBandwidth " + std::to_string(Bandwidth));
 
-    const double pointA = carrier->FrequencyOffsetOfPointA->getValue();
+    // The PRS carries its own point A (a positioning resource may be configured apart from the
+    // serving carrier's grid); a host sets it to the carrier's for a PRS of this carrier.
+    const double pointA = settings->FrequencyOffsetOfPointA->getValue();
     if (!(std::abs(pointA) <= 1.0e10))
-        failWith("FrequencyOffsetOfPointA out of range.", "FrequencyOffsetOfPointA " + std::to_string(pointA));
+        failWith("FrequencyOffsetOfPointA out of range.", path_ + " FrequencyOffsetOfPointA " + std::to_string(pointA));
     PointOffset = static_cast<int>(pointA / ((SlotsPerFrame / 10) * 15000.0));
     if (Bandwidth > 0) {
         const long long low = PointOffset + 12LL * StartPrb, high = PointOffset + 12LL * (StartPrb + Bandwidth) - 1;
