@@ -235,6 +235,8 @@ class PDSCH_Generator {
         int port = 0;      ///< port number less 1000
         int groupOffset = 0;
         std::size_t read = 0;
+        complex* values = nullptr;  ///< the store row's values and occupancy in this frame
+        int* occupancy = nullptr;
     };
     /// One resource element of the walk.
     struct ElementPlace {
@@ -248,7 +250,7 @@ class PDSCH_Generator {
     /// only in how layer and DM-RS values become the value of an antenna row.
     void walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, int frame, OccupancyGrid& symbolFlags,
                         bool firstChannel, bool precoded);
-    void mapElement(const ElementPlace& e, SlotGrid& grid, OccupancyGrid& occupancy, bool precoded);
+    void mapElement(const ElementPlace& e, bool precoded);
     bool dmrsPortValue(const ElementPlace& e, std::size_t r, bool precoded, complex& value) const;
     bool dataPortValue(std::size_t r, bool precoded, complex& value);
 

@@ -115,7 +115,11 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
                 symbolFlags[row.store].size() < static_cast<std::size_t>(f + SymbolsPerSlot))
                 fits = false;
         if (!fits) continue;
-        for (auto& row : rows_) row.read = 0;
+        for (auto& row : rows_) {
+            row.read = 0;
+            row.values = grid[row.store].data();
+            row.occupancy = occupancy[row.store].data();
+        }
         commonRead_ = 0;
 
         ElementPlace e;
@@ -149,7 +153,7 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
                     else if (column >= GridWidth) column -= GridWidth;
                     e.at = line + static_cast<std::size_t>(column);
                     e.re = j;
-                    mapElement(e, grid, occupancy, precoded);
+                    mapElement(e, precoded);
                 }
             }
         }
@@ -157,14 +161,14 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
     CancelRequested.store(0, std::memory_order_relaxed);
 }
 
-void PDSCH_Generator::mapElement(const ElementPlace& e, SlotGrid& grid, OccupancyGrid& occupancy, bool precoded) {
+inline void PDSCH_Generator::mapElement(const ElementPlace& e, bool precoded) {
     const int period = DmrsConfigType == 1 ? 4 : 6;
     const int second = DmrsConfigType == 1 ? 2 : 1;
     bool took = false;
     for (std::size_t r = 0; r < rows_.size(); ++r) {
         MappedRow& row = rows_[r];
-        int& o = occupancy[row.store][e.at];
-        complex& value = grid[row.store][e.at];
+        int& o = row.occupancy[e.at];
+        complex& value = row.values[e.at];
         if (e.isDmrs) {
             // A precoded element carries every port whose CDM group covers it; otherwise the
             // row's own port decides.
@@ -241,7 +245,7 @@ bool PDSCH_Generator::dmrsPortValue(const ElementPlace& e, std::size_t r, bool p
     return true;
 }
 
-bool PDSCH_Generator::dataPortValue(std::size_t r, bool precoded, complex& value) {
+inline bool PDSCH_Generator::dataPortValue(std::size_t r, bool precoded, complex& value) {
     MappedRow& mapped = rows_[r];
     if (!precoded) {
         // The row's own layer, each row reading on at its own pace.
