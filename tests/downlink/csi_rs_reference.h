@@ -24,8 +24,7 @@ inline std::vector<Sample> sequence(int slot, int l, int nId, int count, int sym
     const auto c = pdsch_rx::gold(static_cast<std::uint32_t>(cInit), 2 * count);
     std::vector<Sample> r;
     for (int m = 0; m < count; ++m)
-        r.emplace_back((1 - 2 * c[static_cast<std::size_t>(2 * m)]) / std::sqrt(2.0),
-                       (1 - 2 * c[static_cast<std::size_t>(2 * m + 1)]) / std::sqrt(2.0));
+        r.push_back(pdsch_rx::dmrsValue(c, m));  // QPSK of TS 38.211 clause 5.1.3
     return r;
 }
 
