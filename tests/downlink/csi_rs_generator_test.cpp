@@ -14,6 +14,7 @@
 
 #include "downlink/csi_rs_generator.h"
 #include "downlink/csi_rs_reference.h"
+#include "downlink/frame_store.h"
 #include "framework/json_serializer.h"
 #include "models/nr5g_waveform_settings.h"
 #include "test_support.h"
@@ -25,9 +26,12 @@ using csirs_ref::Entry;
 using Models::Nr5g::NR5GWaveformSettings;
 using Sample = std::complex<double>;
 
-constexpr int kFft = 1024, kCellId = 77, kSymbols = 280;
-constexpr double kPointA = -9.0e6;  // -300 subcarriers of 30 kHz
-constexpr int kPointAOffset = -300;
+constexpr int kCellId = 77;
+using frame_store::at;
+using frame_store::kFft;
+using frame_store::kPointA;
+using frame_store::kSymbols;
+using frame_store::Store;
 
 struct Case {
     const char* name;
@@ -117,18 +121,6 @@ std::unique_ptr<Built> build(const nlohmann::json& doc) {
     return built;
 }
 
-struct Store {
-    Orvalis_NR::SlotGrid grid;
-    Orvalis_NR::OccupancyGrid occupancy, flags;
-    explicit Store(int antennas)
-        : grid(static_cast<std::size_t>(antennas), std::vector<Sample>(static_cast<std::size_t>(kSymbols) * kFft)),
-          occupancy(static_cast<std::size_t>(antennas), std::vector<int>(grid[0].size(), 0)),
-          flags(static_cast<std::size_t>(antennas), std::vector<int>(kSymbols, 0)) {}
-};
-
-std::size_t at(int slot, int l, int k) {
-    return static_cast<std::size_t>((14 * slot + l) * kFft + ((kPointAOffset + k) % kFft + kFft) % kFft);
-}
 
 class CsiRsPattern : public ::testing::TestWithParam<Case> {};
 

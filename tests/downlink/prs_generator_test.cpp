@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "downlink/frame_store.h"
 #include "downlink/pdsch_receiver.h"
 #include "downlink/prs_generator.h"
 #include "framework/json_serializer.h"
@@ -22,7 +23,12 @@ namespace {
 using Models::Nr5g::NR5GWaveformSettings;
 using Sample = std::complex<double>;
 
-constexpr int kFft = 1024, kSlots = 20, kSymbols = 14 * kSlots, kPointAOffset = -300;
+using frame_store::at;
+using frame_store::kFft;
+using frame_store::kPointA;
+using frame_store::kSlots;
+using frame_store::kSymbols;
+using frame_store::Store;
 
 /// k' of Table 7.4.1.7.3-1 by comb size and l - l_start.
 int kPrime(int comb, int i) {
@@ -49,12 +55,12 @@ std::vector<Sample> sequence(int slot, int l, int nId, int count) {
 
 nlohmann::json document(const nlohmann::json& prs, int antennas) {
     nlohmann::json item = {{"Name", "PRS-A"}, {"Enabled", true}, {"SubcarrierSpacing", "SCS30k"},
-                           {"FrequencyOffsetOfPointA", -9.0e6}, {"StartPRB", 0}, {"ResourceBandwidth", 24}};
+                           {"FrequencyOffsetOfPointA", kPointA}, {"StartPRB", 0}, {"ResourceBandwidth", 24}};
     item.update(prs);
     return {{"SampleRateAuto", 30.72e6},
             {"NumberOfAntennas", antennas},
             {"NRCarriers",
-             {{{"CarrierType", "DL"}, {"FrequencyOffsetOfPointA", -9.0e6}, {"Downlink", {{"PRS", {item}}}}}}}};
+             {{{"CarrierType", "DL"}, {"FrequencyOffsetOfPointA", kPointA}, {"Downlink", {{"PRS", {item}}}}}}}};
 }
 
 struct Built {
@@ -72,18 +78,6 @@ std::unique_ptr<Built> build(const nlohmann::json& doc) {
     return built;
 }
 
-struct Store {
-    Orvalis_NR::SlotGrid grid;
-    Orvalis_NR::OccupancyGrid occupancy, flags;
-    explicit Store(int antennas)
-        : grid(static_cast<std::size_t>(antennas), std::vector<Sample>(static_cast<std::size_t>(kSymbols) * kFft)),
-          occupancy(static_cast<std::size_t>(antennas), std::vector<int>(grid[0].size(), 0)),
-          flags(static_cast<std::size_t>(antennas), std::vector<int>(kSymbols, 0)) {}
-};
-
-std::size_t at(int slot, int l, int k) {
-    return static_cast<std::size_t>((14 * slot + l) * kFft + ((kPointAOffset + k) % kFft + kFft) % kFft);
-}
 
 struct CombCase {
     int comb, symbols, firstSymbol, reOffset, startPrb, bandwidth, sequenceId;
