@@ -8,6 +8,7 @@
 #include "framework/json_serializer.h"
 #include "framework/model_container.h"
 #include "models/all_models.h"
+#include "validation/document_check.h"
 
 namespace nrsynth_cli {
 
@@ -50,20 +51,11 @@ int showDefaults(const std::string& typeName) {
 
 int validateDocument(const std::string& path) {
     try {
-        JsonSerializer reader;
-        reader.setCollectIssues(true);
-        reader.deserialize(readTextFile(path));
-        for (const auto& key : reader.getUnknownKeys()) std::cout << "unknown key: " << key << "\n";
-        for (const auto& issue : reader.getIssues()) std::cout << "wrong value: " << issue << "\n";
-        const auto problems = reader.getUnknownKeys().size() + reader.getIssues().size();
-        if (problems == 0) {
-            std::cout << path << ": OK\n";
-            return 0;
-        }
-        std::cout << path << ": " << problems << " problem(s)\n";
-        return 1;
+        const auto check = validation::checkDocument(readTextFile(path));
+        validation::printDocumentCheck(std::cout, path, check);
+        return check.errorCount() == 0 ? 0 : 1;
     } catch (const std::exception& e) {
-        std::cerr << "nrsynth validate: " << e.what() << "\n";
+        std::cerr << "nrsynth validate: " << path << ": " << e.what() << "\n";
         return 1;
     }
 }

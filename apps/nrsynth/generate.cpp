@@ -14,6 +14,7 @@
 #include "framework/json_serializer.h"
 #include "models/nr5g_waveform_settings.h"
 #include "nrsynth/nrsynth.h"
+#include "validation/document_check.h"
 
 namespace nrsynth_cli {
 
@@ -61,6 +62,21 @@ bool step(const char* name) {
     return false;
 }
 
+/// The validator's pass before generation: errors stop it unless --force, warnings are printed.
+bool passesChecks(const GenerateOptions& options, const std::string& json) {
+    validation::DocumentCheck check;
+    try {
+        check = validation::checkDocument(json);
+    } catch (const std::exception&) {
+        return true;  // not JSON at all: the library's reader names the fault
+    }
+    if (check.errorCount() == 0 && check.warningCount() == 0) return true;
+    validation::printDocumentCheck(std::cerr, options.wave, check);
+    if (check.errorCount() == 0 || options.force) return true;
+    std::cerr << "nrsynth generate: refused: correct the errors above, or give --force to generate anyway\n";
+    return false;
+}
+
 }  // namespace
 
 int generateWaveform(const GenerateOptions& options) {
@@ -71,6 +87,7 @@ int generateWaveform(const GenerateOptions& options) {
         std::cerr << "nrsynth generate: " << e.what() << "\n";
         return 1;
     }
+    if (!passesChecks(options, json)) return 1;
     StartDeserialize(json.c_str());
     if (!step("StartDeserialize")) return 1;
 

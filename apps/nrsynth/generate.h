@@ -9,10 +9,12 @@ struct GenerateOptions {
     std::string wave;                        ///< waveform document (JSON)
     std::string output = "out/wave.bin";     ///< sample file path; markers go to PATH.mkr
     std::string exportFolder;                ///< intermediate data export, empty for none
+    bool force = false;                      ///< generate even when the validator finds errors
 };
 
-/// Generates the waveform and prints log, status, files and a per-antenna summary.
-/// Exit code 0, or 1 when any step reports status -1.
+/// Runs the validator first (errors refuse unless `force`, warnings are printed), then generates
+/// the waveform and prints log, status, files and a per-antenna summary.
+/// Exit code 0, or 1 when the validator refuses or any step reports status -1.
 int generateWaveform(const GenerateOptions& options);
 
 }  // namespace nrsynth_cli

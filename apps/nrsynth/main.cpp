@@ -21,7 +21,8 @@ int main(int argc, char** argv) {
                      "print a default instance of a model type instead, e.g. NRDLSCH");
 
     auto* validate = app.add_subcommand(
-        "validate", "Report unknown keys and values of the wrong kind in WAVE.json");
+        "validate", "Check WAVE.json: unknown keys, values of the wrong kind and the 3GPP rules (ranges, "
+                    "allocations, DM-RS, collisions); exit code 1 on any error");
     validate->add_option("wave", wave, "waveform document (JSON)")->required();
 
     nrsynth_cli::GenerateOptions generateOptions;
@@ -32,6 +33,7 @@ int main(int argc, char** argv) {
     generate->add_option("-o,--output", generateOptions.output,
                          "sample file path; several antennas get their number before the extension")
         ->capture_default_str();
+    generate->add_flag("--force", generateOptions.force, "generate even when the checks of `validate` find errors");
     generate->add_option("--export", generateOptions.exportFolder, "folder for the intermediate data export (reserved: this version writes no export yet)");
 
     CLI11_PARSE(app, argc, argv);
