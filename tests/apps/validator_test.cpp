@@ -51,6 +51,15 @@ json csiRs(bool puncturing) {
             {"Density", "One"}, {"SlotIndexArrayStr", "0"}, {"AntennaPortArray", "3000"}, {"REUsedForPDSCH", puncturing}};
 }
 
+// A Case C burst of four blocks in the first half frame, centred on the carrier: block 0 takes
+// symbols 2 to 5 of slot 0 and RBs 15 to 35.
+void ssbOn(json& d) {
+    carrier(d)["FrequencyOffsetOfPointA"] = -9180000;
+    carrier(d)["Downlink"]["SSPBCH"] = {{"Enabled", true}, {"Mu", 1}, {"Numerology", "SCS30k"}, {"SSBlockPattern", "CaseC"},
+                                        {"SSB30KSymbolIndex", "Option1"}, {"Lmax", 4}, {"SSBPeriod", "OneFrame"}};
+    bwp(d)["Coreset0"]["FrequencyDomainBitmap"] = "0011";
+}
+
 struct RuleCase {
     const char* name;
     std::function<void(json&)> change;
@@ -132,6 +141,7 @@ const RuleCase kCases[] = {
      "", Severity::Error},
     {"five layers in one code word",
      [](json& d) {
+         d["NumberOfAntennas"] = 8;
          pdsch(d)["NumberOfLayers"] = 5; pdsch(d)["DMRSports"] = "0,1,2,3,4"; pdsch(d)["DMRSDuration"] = "DoubleSymbol";
          pdsch(d)["NumberOfDMRSCDMGroup"] = 2; pdsch(d)["NumberOfAntennaPorts"] = 5; pdsch(d)["AntennaPortArray"] = "1000,1001,1002,1003,1004";
      },
@@ -165,6 +175,11 @@ const RuleCase kCases[] = {
     {"CSI-RS puncturing the PDSCH", [](json& d) { carrier(d)["Downlink"]["CSIRS"] = json::array({csiRs(true)}); },
      "NRCarriers[0].Downlink.CSIRS[0].REUsedForPDSCH", Severity::Warning},
     {"CSI-RS the PDSCH rate-matches around", [](json& d) { carrier(d)["Downlink"]["CSIRS"] = json::array({csiRs(false)}); }, "", Severity::Error},
+    {"CORESET over an SS/PBCH block", [](json& d) { ssbOn(d); dci(d)["FirstSymbol"] = 2; },
+     "NRCarriers[0].Downlink.DCI[0].SlotIndexArrayStr", Severity::Error},
+    {"CORESET beside an SS/PBCH block in time", [](json& d) { ssbOn(d); }, "", Severity::Error},
+    {"CORESET beside an SS/PBCH block in frequency",
+     [](json& d) { ssbOn(d); dci(d)["FirstSymbol"] = 2; bwp(d)["Coreset0"]["FrequencyDomainBitmap"] = "11"; }, "", Severity::Error},
     // Disabled items are not generated, so they are not checked.
     {"disabled PDSCH with a bad MCS", [](json& d) { pdsch(d)["MCS"] = 40; pdsch(d)["Enabled"] = false; }, "", Severity::Error},
 };

@@ -11,7 +11,9 @@
 #include "models/nr_dl_bwp.h"
 #include "models/nr_dlsch.h"
 #include "models/nr_downlink.h"
+#include "models/nr_sspbch.h"
 #include "rule_support.h"
+#include "ssb_overlap.h"
 #include "tables/csirs_prs_tables.h"
 
 namespace nrsynth_cli::validation {
@@ -23,6 +25,7 @@ struct Footprint {
     std::string path;
     int mu = 0;
     int bwpIndex = 0;
+    int perSlot = 14;
     std::vector<int> slots;
     std::vector<int> symbols;
     std::vector<int> rbs;  ///< common RBs (from point A)
@@ -72,7 +75,8 @@ struct DownlinkChannels {
     std::vector<int> pdschRmCoreset;  ///< CoresetIdForRM per PDSCH
     std::vector<Footprint> coresets;  ///< one per enabled DCI: its CORESET in its slots
     std::vector<int> coresetIds;
-    std::vector<Footprint> puncturingCsiRs;
+    std::vector<Footprint> csiRs;
+    std::vector<bool> csiRsPunctures;  ///< REUsedForPDSCH: the PDSCH is not rate-matched around it
 };
 
 DownlinkChannels collect(const CarrierRef& ref) {
@@ -113,6 +117,7 @@ DownlinkChannels collect(const CarrierRef& ref) {
         f.symbols = rangeOf(dci.FirstSymbol->getValue(), std::clamp(coreset->SymbolNumber->getValue(), 0, 3));
         f.rbs = commonRbs(coresetRbs(*coreset, *bwp), *bwp);
         f.antennas = antennaRows(dci.AntennaPortArray->getValue());
+        f.perSlot = symbolsPerSlot(bwp->CPType->getValue());
         channels.coresets.push_back(std::move(f));
         channels.coresetIds.push_back(coreset->ID->getValue());
     }
@@ -121,8 +126,7 @@ DownlinkChannels collect(const CarrierRef& ref) {
     for (int i = 0; i < csiRss->getCount(); ++i) {
         const auto& csiRs = *csiRss->getItem(i);
         const auto* bwp = downlinkBwp(carrier, csiRs.BWPIndex->getValue());
-        // With REUsedForPDSCH false the PDSCH is rate-matched around the resource.
-        if (!csiRs.Enabled->getValue() || !bwp || !csiRs.REUsedForPDSCH->getValue()) continue;
+        if (!csiRs.Enabled->getValue() || !bwp) continue;
         Footprint f;
         f.path = itemPath(base, "CSIRS", i);
         f.mu = muOf(bwp->Numerology->getValue());
@@ -131,13 +135,53 @@ DownlinkChannels collect(const CarrierRef& ref) {
         f.symbols = csiRsSymbols(csiRs);
         f.rbs = commonRbs(rangeOf(csiRs.RBOffset->getValue(), std::clamp(csiRs.RBNumber->getValue(), 0, 4096)), *bwp);
         f.antennas = antennaRows(csiRs.AntennaPortArray->getValue());
-        channels.puncturingCsiRs.push_back(std::move(f));
+        f.perSlot = symbolsPerSlot(bwp->CPType->getValue());
+        channels.csiRs.push_back(std::move(f));
+        channels.csiRsPunctures.push_back(csiRs.REUsedForPDSCH->getValue());
     }
     return channels;
 }
 
-void checkDownlink(const CarrierRef& ref, FindingList& findings) {
+/// The first SS/PBCH block that a channel meets on one of its antennas, or null.
+const SsbBlock* blockMet(const Footprint& f, const std::vector<SsbBlock>& blocks, const std::vector<int>& ssbAntennas) {
+    if (f.rbs.empty() || !overlaps(f.antennas, ssbAntennas)) return nullptr;
+    const double rbWidth = 12 * 15000.0 * (1 << f.mu);
+    const auto [lowRb, highRb] = std::minmax_element(f.rbs.begin(), f.rbs.end());
+    const double low = *lowRb * rbWidth;
+    const double high = (*highRb + 1) * rbWidth;
+    for (const auto& block : blocks) {
+        if (high <= block.lowHz || low >= block.highHz) continue;
+        for (int slot : f.slots)
+            for (int symbol : f.symbols) {
+                const long long start = symbolStart(f.mu, slot, symbol, f.perSlot);
+                if (start < block.timeEnd && start + symbolLength(f.mu) > block.timeStart) return &block;
+            }
+    }
+    return nullptr;
+}
+
+/// Neither the PDCCH nor a CSI-RS is mapped around an SS/PBCH block (the PDSCH is, always).
+void checkOverSsb(const CarrierRef& ref, const DownlinkChannels& channels, int frames, FindingList& findings) {
+    const auto& ssb = *ref.carrier->Downlink->getValue()->SSPBCH->getValue();
+    const auto blocks = ssbBlocks(ssb, *ref.carrier, frames);
+    if (blocks.empty()) return;
+    const auto ssbAntennas = antennaRows(ssb.AntennaPortArray->getValue());
+    const auto report = [&](const Footprint& f, const char* what) {
+        const auto* block = blockMet(f, blocks, ssbAntennas);
+        if (!block) return;
+        findings.error(f.path + ".SlotIndexArrayStr", "slots of " + f.path,
+                       std::string(what) + " meets SS/PBCH block " + std::to_string(block->index) + " of frame " +
+                           std::to_string(block->frame) +
+                           " on one antenna: the SS/PBCH block's resource elements are not available to it "
+                           "(TS 38.213 clause 4.1); move it in slots, symbols or RBs");
+    };
+    for (const auto& coreset : channels.coresets) report(coreset, "the CORESET of this PDCCH");
+    for (const auto& csiRs : channels.csiRs) report(csiRs, "the CSI-RS");
+}
+
+void checkDownlink(const CarrierRef& ref, int frames, FindingList& findings) {
     const auto channels = collect(ref);
+    checkOverSsb(ref, channels, frames, findings);
     const auto& pdschs = channels.pdschs;
     for (std::size_t i = 0; i < pdschs.size(); ++i) {
         for (std::size_t j = 0; j < i; ++j)
@@ -155,8 +199,8 @@ void checkDownlink(const CarrierRef& ref, FindingList& findings) {
                                "): set CoresetIdForRM to " + std::to_string(channels.coresetIds[c]) +
                                " so that the PDSCH is rate-matched around it (TS 38.214 clause 5.1.4.1)");
         }
-        for (const auto& csiRs : channels.puncturingCsiRs)
-            if (meet(pdschs[i], csiRs))
+        for (std::size_t c = 0; c < channels.csiRs.size(); ++c)
+            if (const auto& csiRs = channels.csiRs[c]; channels.csiRsPunctures[c] && meet(pdschs[i], csiRs))
                 findings.warning(csiRs.path + ".REUsedForPDSCH", "true",
                                  "the CSI-RS punctures the data of " + pdschs[i].path + " (" + whereTheyMeet(pdschs[i], csiRs) +
                                      "); set REUsedForPDSCH to false to rate-match the PDSCH around it (TS 38.214 clause 5.1.4)");
@@ -167,7 +211,8 @@ void checkDownlink(const CarrierRef& ref, FindingList& findings) {
 
 void checkCollisions(const nr::NR5GWaveformSettings& waveform, FindingList& findings) {
     for (const auto& ref : activeCarriers(waveform))
-        if (ref.carrier->CarrierType->getValue() == nr::CarrierType::DL) checkDownlink(ref, findings);
+        if (ref.carrier->CarrierType->getValue() == nr::CarrierType::DL)
+            checkDownlink(ref, waveform.NumberOfFrames->getValue(), findings);
 }
 
 }  // namespace nrsynth_cli::validation

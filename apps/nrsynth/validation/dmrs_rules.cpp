@@ -18,7 +18,8 @@ namespace {
 namespace tables = Orvalis_NR::tables;
 
 /// TS 38.214 Table 5.1.2.1-1: start S and length L of a PDSCH per mapping type and prefix.
-void checkTimeAllocation(const std::string& path, const nr::NRDLSCH& pdsch, bool extendedCp, FindingList& findings) {
+/// False when S or L is outside it: the DM-RS rules then have nothing sound to check.
+bool checkTimeAllocation(const std::string& path, const nr::NRDLSCH& pdsch, bool extendedCp, FindingList& findings) {
     const bool typeB = pdsch.PDSCHMappingType->getValue() == nr::PDSCHMappingType::B;
     const int s = pdsch.FirstSymbol->getValue();
     const int l = pdsch.SymbolNumber->getValue();
@@ -28,12 +29,16 @@ void checkTimeAllocation(const std::string& path, const nr::NRDLSCH& pdsch, bool
     const int maxLength = typeB ? (extendedCp ? 6 : 13) : slotEnd;
     const std::string where = std::string(" for mapping type ") + (typeB ? "B" : "A") + (extendedCp ? ", extended prefix" : "") +
                               " (TS 38.214 Table 5.1.2.1-1)";
-    if (s < 0 || s > maxStart)
+    if (s < 0 || s > maxStart) {
         findings.error(path + ".FirstSymbol", std::to_string(s), "the start S is 0 to " + std::to_string(maxStart) + where);
-    else if (l < minLength || l > maxLength || s + l > slotEnd)
+        return false;
+    }
+    if (l < minLength || l > maxLength || s + l > slotEnd) {
         findings.error(path + ".SymbolNumber", std::to_string(l),
                        "the length L is " + std::to_string(minLength) + " to " + std::to_string(std::min(maxLength, slotEnd - s)) +
                            " from S = " + std::to_string(s) + where);
+        return false;
+    }
     if (!typeB) {
         const int apos = pdsch.DMRStypeApos->getValue();
         if (apos != 2 && apos != 3)
@@ -45,7 +50,11 @@ void checkTimeAllocation(const std::string& path, const nr::NRDLSCH& pdsch, bool
         else if (apos == 3 && pdsch.DMRSaddpos->getValue() == 3)
             findings.error(path + ".DMRSaddpos", "3",
                            "dmrs-AdditionalPosition 3 is only defined with dmrs-TypeA-Position 2 (TS 38.211 clause 7.4.1.1.2)");
+        else
+            return true;
+        return false;
     }
+    return true;
 }
 
 void checkDmrsPositions(const std::string& path, const nr::NRDLSCH& pdsch, FindingList& findings) {
@@ -177,8 +186,8 @@ void checkDmrs(const nr::NR5GWaveformSettings& waveform, FindingList& findings) 
             if (!pdsch.Enabled->getValue()) continue;
             const std::string path = itemPath(ref.path + ".Downlink", "DLSCH", i);
             const auto* bwp = downlinkBwp(*ref.carrier, pdsch.BWPIndex->getValue());
-            checkTimeAllocation(path, pdsch, bwp && bwp->CPType->getValue() == nr::CyclicPrefixType::Extended, findings);
-            checkDmrsPositions(path, pdsch, findings);
+            if (checkTimeAllocation(path, pdsch, bwp && bwp->CPType->getValue() == nr::CyclicPrefixType::Extended, findings))
+                checkDmrsPositions(path, pdsch, findings);
             checkPorts(path, pdsch, antennas, findings);
             checkPtrs(path, pdsch, findings);
         }
