@@ -58,6 +58,7 @@ void ssbOn(json& d) {
     carrier(d)["Downlink"]["SSPBCH"] = {{"Enabled", true}, {"Mu", 1}, {"Numerology", "SCS30k"}, {"SSBlockPattern", "CaseC"},
                                         {"SSB30KSymbolIndex", "Option1"}, {"Lmax", 4}, {"SSBPeriod", "OneFrame"}};
     bwp(d)["Coreset0"]["FrequencyDomainBitmap"] = "0011";
+    pdsch(d)["SlotIndexArrayStr"] = "2";  // the four blocks lie in slots 0 and 1
 }
 
 struct RuleCase {
@@ -180,6 +181,8 @@ const RuleCase kCases[] = {
     {"CORESET beside an SS/PBCH block in time", [](json& d) { ssbOn(d); }, "", Severity::Error},
     {"CORESET beside an SS/PBCH block in frequency",
      [](json& d) { ssbOn(d); dci(d)["FirstSymbol"] = 2; bwp(d)["Coreset0"]["FrequencyDomainBitmap"] = "11"; }, "", Severity::Error},
+    {"PDSCH rate-matched around an SS/PBCH block", [](json& d) { ssbOn(d); pdsch(d)["SlotIndexArrayStr"] = "1"; },
+     "NRCarriers[0].Downlink.DLSCH[0].SlotIndexArrayStr", Severity::Warning},
     // Disabled items are not generated, so they are not checked.
     {"disabled PDSCH with a bad MCS", [](json& d) { pdsch(d)["MCS"] = 40; pdsch(d)["Enabled"] = false; }, "", Severity::Error},
 };

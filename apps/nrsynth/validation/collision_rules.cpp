@@ -142,9 +142,9 @@ DownlinkChannels collect(const CarrierRef& ref) {
     return channels;
 }
 
-/// The first SS/PBCH block that a channel meets on one of its antennas, or null.
-const SsbBlock* blockMet(const Footprint& f, const std::vector<SsbBlock>& blocks, const std::vector<int>& ssbAntennas) {
-    if (f.rbs.empty() || !overlaps(f.antennas, ssbAntennas)) return nullptr;
+/// The first SS/PBCH block that a channel meets, or null; `slotMet` receives the channel's slot.
+const SsbBlock* blockMet(const Footprint& f, const std::vector<SsbBlock>& blocks, int& slotMet) {
+    if (f.rbs.empty()) return nullptr;
     const double rbWidth = 12 * 15000.0 * (1 << f.mu);
     const auto [lowRb, highRb] = std::minmax_element(f.rbs.begin(), f.rbs.end());
     const double low = *lowRb * rbWidth;
@@ -154,7 +154,10 @@ const SsbBlock* blockMet(const Footprint& f, const std::vector<SsbBlock>& blocks
         for (int slot : f.slots)
             for (int symbol : f.symbols) {
                 const long long start = symbolStart(f.mu, slot, symbol, f.perSlot);
-                if (start < block.timeEnd && start + symbolLength(f.mu) > block.timeStart) return &block;
+                if (start < block.timeEnd && start + symbolLength(f.mu) > block.timeStart) {
+                    slotMet = slot;
+                    return &block;
+                }
             }
     }
     return nullptr;
@@ -166,10 +169,12 @@ void checkOverSsb(const CarrierRef& ref, const DownlinkChannels& channels, int f
     const auto blocks = ssbBlocks(ssb, *ref.carrier, frames);
     if (blocks.empty()) return;
     const auto ssbAntennas = antennaRows(ssb.AntennaPortArray->getValue());
+    int slot = 0;
     const auto report = [&](const Footprint& f, const char* what) {
-        const auto* block = blockMet(f, blocks, ssbAntennas);
+        if (!overlaps(f.antennas, ssbAntennas)) return;
+        const auto* block = blockMet(f, blocks, slot);
         if (!block) return;
-        findings.error(f.path + ".SlotIndexArrayStr", "slots of " + f.path,
+        findings.error(f.path + ".SlotIndexArrayStr", "slot " + std::to_string(slot),
                        std::string(what) + " meets SS/PBCH block " + std::to_string(block->index) + " of frame " +
                            std::to_string(block->frame) +
                            " on one antenna: the SS/PBCH block's resource elements are not available to it "
@@ -177,6 +182,15 @@ void checkOverSsb(const CarrierRef& ref, const DownlinkChannels& channels, int f
     };
     for (const auto& coreset : channels.coresets) report(coreset, "the CORESET of this PDCCH");
     for (const auto& csiRs : channels.csiRs) report(csiRs, "the CSI-RS");
+    // The PDSCH is rate-matched around the block on every antenna: worth knowing, since the
+    // transport block size does not count those elements and the code rate rises.
+    for (const auto& pdsch : channels.pdschs)
+        if (const auto* block = blockMet(pdsch, blocks, slot))
+            findings.warning(pdsch.path + ".SlotIndexArrayStr", "slot " + std::to_string(slot),
+                             "the PDSCH's RBs meet SS/PBCH block " + std::to_string(block->index) + " of frame " +
+                                 std::to_string(block->frame) +
+                                 ": it is rate-matched around the block, which the transport block size of TS 38.214 "
+                                 "clause 5.1.3.2 does not count, so the effective code rate rises");
 }
 
 void checkDownlink(const CarrierRef& ref, int frames, FindingList& findings) {
