@@ -61,6 +61,16 @@ void ssbOn(json& d) {
     pdsch(d)["SlotIndexArrayStr"] = "2";  // the four blocks lie in slots 0 and 1
 }
 
+// The same carrier as an uplink carrier with one PUSCH over its BWP.
+void uplinkOnly(json& d) {
+    carrier(d)["CarrierType"] = "UL";
+    carrier(d)["Uplink"] = json::parse(R"({
+      "BWP": [{"Numerology": "SCS30k", "Mu": 1, "RBOffset": 0, "RBNumber": 51}],
+      "ULSCH": [{"BWPIndex": 0, "DMRSports": "0", "NumberOfLayers": 1, "NumberOfAntennaPorts": 1, "AntennaPortArray": "1000",
+                 "RBOffset": 0, "RBNumber": 51, "SlotIndexArrayStr": "0", "MCS": 3}]})");
+}
+json& pusch(json& d) { return carrier(d)["Uplink"]["ULSCH"][0]; }
+
 struct RuleCase {
     const char* name;
     std::function<void(json&)> change;
@@ -183,6 +193,18 @@ const RuleCase kCases[] = {
      [](json& d) { ssbOn(d); dci(d)["FirstSymbol"] = 2; bwp(d)["Coreset0"]["FrequencyDomainBitmap"] = "11"; }, "", Severity::Error},
     {"PDSCH rate-matched around an SS/PBCH block", [](json& d) { ssbOn(d); pdsch(d)["SlotIndexArrayStr"] = "1"; },
      "NRCarriers[0].Downlink.DLSCH[0].SlotIndexArrayStr", Severity::Warning},
+    // Uplink
+    {"PUSCH is clean", [](json& d) { uplinkOnly(d); }, "", Severity::Error},
+    {"PUSCH past its BWP", [](json& d) { uplinkOnly(d); pusch(d)["RBNumber"] = 52; }, "NRCarriers[0].Uplink.ULSCH[0].RBNumber", Severity::Error},
+    {"PUSCH MCS 28 reserved in table 6.1.4.1-1",
+     [](json& d) { uplinkOnly(d); pusch(d)["MCSTable"] = "Table61411"; pusch(d)["MCS"] = 28; },
+     "NRCarriers[0].Uplink.ULSCH[0].MCS", Severity::Warning},
+    {"two layers with transform precoding",
+     [](json& d) {
+         uplinkOnly(d); pusch(d)["TransformPrecoding"] = true; pusch(d)["NumberOfLayers"] = 2; pusch(d)["DMRSports"] = "0,1";
+         pusch(d)["NumberOfAntennaPorts"] = 2;
+     },
+     "NRCarriers[0].Uplink.ULSCH[0].NumberOfLayers", Severity::Error},
     // Disabled items are not generated, so they are not checked.
     {"disabled PDSCH with a bad MCS", [](json& d) { pdsch(d)["MCS"] = 40; pdsch(d)["Enabled"] = false; }, "", Severity::Error},
 };

@@ -8,6 +8,8 @@
 #include "models/nr_dl_bwp.h"
 #include "models/nr_dlsch.h"
 #include "models/nr_downlink.h"
+#include "models/nr_ulsch.h"
+#include "models/nr_uplink.h"
 #include "rule_support.h"
 #include "tables/pdsch_tables.h"
 
@@ -174,11 +176,37 @@ void checkPtrs(const std::string& path, const nr::NRDLSCH& pdsch, FindingList& f
         }
 }
 
+/// PUSCH layers and ports: at most 4 layers, one with transform precoding (TS 38.211 clauses
+/// 6.3.1.3 and 6.3.1.4), one DM-RS port per layer.
+void checkUplinkPorts(const std::string& path, const nr::NRULSCH& pusch, FindingList& findings) {
+    const int layers = pusch.NumberOfLayers->getValue();
+    const bool precoded = pusch.TransformPrecoding->getValue();
+    if (layers < 1 || layers > 4 || (precoded && layers != 1)) {
+        findings.error(path + ".NumberOfLayers", std::to_string(layers),
+                       precoded ? "transform precoding carries a single layer (TS 38.211 clause 6.3.1.4)"
+                                : "a PUSCH has 1 to 4 layers (TS 38.211 clause 6.3.1.3)");
+        return;
+    }
+    const auto ports = intList(pusch.DMRSports->getValue());
+    if (!ports || static_cast<int>(ports->size()) != layers)
+        findings.error(path + ".DMRSports", quoted(pusch.DMRSports->getValue()),
+                       "expected one DM-RS port per layer: NumberOfLayers is " + std::to_string(layers));
+    if (pusch.NumberOfAntennaPorts->getValue() < layers)
+        findings.error(path + ".NumberOfAntennaPorts", std::to_string(pusch.NumberOfAntennaPorts->getValue()),
+                       "at least one antenna port per layer: NumberOfLayers is " + std::to_string(layers));
+}
+
 }  // namespace
 
 void checkDmrs(const nr::NR5GWaveformSettings& waveform, FindingList& findings) {
     const int antennas = waveform.NumberOfAntennas->getValue();
     for (const auto& ref : activeCarriers(waveform)) {
+        if (ref.carrier->CarrierType->getValue() == nr::CarrierType::UL) {
+            const auto puschs = ref.carrier->Uplink->getValue()->ULSCH->getValue();
+            for (int i = 0; i < puschs->getCount(); ++i)
+                if (puschs->getItem(i)->Enabled->getValue())
+                    checkUplinkPorts(itemPath(ref.path + ".Uplink", "ULSCH", i), *puschs->getItem(i), findings);
+        }
         if (ref.carrier->CarrierType->getValue() != nr::CarrierType::DL) continue;
         const auto pdschs = ref.carrier->Downlink->getValue()->DLSCH->getValue();
         for (int i = 0; i < pdschs->getCount(); ++i) {
