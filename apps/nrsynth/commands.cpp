@@ -6,6 +6,7 @@
 #include <stdexcept>
 
 #include "framework/json_serializer.h"
+#include "host/derived_values.h"
 #include "framework/model_container.h"
 #include "models/all_models.h"
 #include "validation/document_check.h"
@@ -33,6 +34,30 @@ int showDocument(const std::string& path) {
         return 0;
     } catch (const std::exception& e) {
         std::cerr << "nrsynth show: " << e.what() << "\n";
+        return 1;
+    }
+}
+
+CompletedText completedDocumentText(const std::string& path, const std::string& command) {
+    const std::string text = readTextFile(path);
+    const auto document = nlohmann::ordered_json::parse(text, nullptr, false);
+    // Text that is not JSON goes to the library as it stands: its reader names the fault.
+    if (document.is_discarded() || !document.is_object()) return {text, 0, 0};
+    const auto completion = nrsynth_host::completeDocument(document);
+    for (const auto& problem : completion.problems)
+        std::cerr << command << ": " << path << ": cannot work out " << problem << "\n";
+    return {completion.document.dump(1), static_cast<int>(completion.derived.size()),
+            static_cast<int>(completion.problems.size())};
+}
+
+int showDerivedDocument(const std::string& path) {
+    try {
+        const auto completed = completedDocumentText(path, "nrsynth show");
+        std::cout << completed.text << "\n";
+        std::cerr << "nrsynth show: " << completed.derived << " value(s) worked out\n";
+        return completed.problems == 0 ? 0 : 1;
+    } catch (const std::exception& e) {
+        std::cerr << "nrsynth show: " << path << ": " << e.what() << "\n";
         return 1;
     }
 }

@@ -82,9 +82,23 @@ bool passesChecks(const GenerateOptions& options, const std::string& json) {
 int generateWaveform(const GenerateOptions& options) {
     std::string json;
     try {
-        json = readTextFile(options.wave);
+        if (options.asIs) {
+            json = readTextFile(options.wave);
+        } else {
+            const auto completed = completedDocumentText(options.wave, "nrsynth generate");
+            if (completed.problems > 0 && !options.force) {
+                std::cerr << "nrsynth generate: " << completed.problems
+                          << " host value(s) could not be worked out; give them in the document, or use --as-is "
+                             "or --force\n";
+                return 1;
+            }
+            if (completed.derived > 0)
+                std::cout << "worked out " << completed.derived << " host value(s) the document leaves out"
+                          << " (nrsynth show --derived prints them)\n";
+            json = completed.text;
+        }
     } catch (const std::exception& e) {
-        std::cerr << "nrsynth generate: " << e.what() << "\n";
+        std::cerr << "nrsynth generate: " << options.wave << ": " << e.what() << "\n";
         return 1;
     }
     if (!passesChecks(options, json)) return 1;

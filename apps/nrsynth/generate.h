@@ -10,6 +10,7 @@ struct GenerateOptions {
     std::string output = "out/wave.bin";     ///< sample file path; markers go to PATH.mkr
     std::string exportFolder;                ///< intermediate data export, empty for none
     bool force = false;                      ///< generate even when the validator finds errors
+    bool asIs = false;                       ///< hand the document over without derived values
 };
 
 /// Runs the validator first (errors refuse unless `force`, warnings are printed), then generates

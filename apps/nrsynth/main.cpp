@@ -19,6 +19,11 @@ int main(int argc, char** argv) {
     show->add_option("wave", wave, "waveform document (JSON)");
     show->add_option("--defaults", defaultsType,
                      "print a default instance of a model type instead, e.g. NRDLSCH");
+    bool derived = false;
+    show->add_flag("--derived", derived,
+                   "print the document itself with every host value it leaves out worked out "
+                   "(Mu, SampleRateAuto, SlotIndexArrayStr, LastSymbol, BWPIndex, Modulation, CodingRate, "
+                   "TransportBlockSize): what generate hands the library");
 
     auto* validate = app.add_subcommand(
         "validate", "Check WAVE.json: unknown keys, values of the wrong kind and the 3GPP rules (ranges, "
@@ -34,6 +39,9 @@ int main(int argc, char** argv) {
                          "sample file path; several antennas get their number before the extension")
         ->capture_default_str();
     generate->add_flag("--force", generateOptions.force, "generate even when the checks of `validate` find errors");
+    generate->add_flag("--as-is", generateOptions.asIs,
+                       "hand the document to the library as it stands, without working out the host values it "
+                       "leaves out");
     generate->add_option("--export", generateOptions.exportFolder, "folder for the intermediate data export (reserved: this version writes no export yet)");
 
     CLI11_PARSE(app, argc, argv);
@@ -44,7 +52,7 @@ int main(int argc, char** argv) {
             std::cerr << "nrsynth show: give WAVE.json or --defaults TYPE\n";
             return 1;
         }
-        return nrsynth_cli::showDocument(wave);
+        return derived ? nrsynth_cli::showDerivedDocument(wave) : nrsynth_cli::showDocument(wave);
     }
     if (*validate) return nrsynth_cli::validateDocument(wave);
     if (*generate) return nrsynth_cli::generateWaveform(generateOptions);
