@@ -9,17 +9,7 @@ src/tables/small_block_tables.h: TS 38.212 Table 5.3.3.3-1 (basis sequences of t
 Usage: tools/gen_coding_tables.py [--check]   (--check: fail when a committed header differs)
 """
 
-import json
-import pathlib
-import sys
-
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-DATA = ROOT / "data" / "3gpp"
-TABLES = ROOT / "src" / "tables"
-
-
-def load(name):
-    return json.loads((DATA / name).read_text())
+from table_generation import TABLES, emit, load
 
 
 def rows_of(doc, key, length, allowed):
@@ -130,7 +120,7 @@ inline constexpr std::array<int, {len(prime_list)}> kZadoffChuPrimes = {{
 
 
 def render_small_block():
-    doc = json.loads((DATA / "ts38212_table_5_3_3_3_1_small_block_basis_sequences.json").read_text())
+    doc = load("ts38212_table_5_3_3_3_1_small_block_basis_sequences.json")
     rows = doc["rows"]
     if [r[0] for r in rows] != list(range(32)):
         raise SystemExit("expected rows i = 0..31 in order")
@@ -164,12 +154,8 @@ def main():
         TABLES / "base_sequence_tables.h": render_base_sequences(),
         TABLES / "small_block_tables.h": render_small_block(),
     }
-    check = "--check" in sys.argv[1:]
     for path, text in outputs.items():
-        if not check:
-            path.write_text(text)
-        elif path.read_text() != text:
-            raise SystemExit(f"{path} is out of date; run {sys.argv[0]}")
+        emit(path, text)
 
 
 if __name__ == "__main__":

@@ -11,13 +11,9 @@ TS 38.211 Table 7.4.1.7.3-1: PRS k' per comb size and symbol of the resource, an
 Usage: tools/gen_csirs_prs_tables.py [--check]   (--check: fail when the committed header differs)
 """
 
-import json
-import pathlib
-import sys
+from table_generation import TABLES, emit, load
 
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-DATA = ROOT / "data" / "3gpp"
-OUTPUT = ROOT / "src" / "tables" / "csirs_prs_tables.h"
+OUTPUT = TABLES / "csirs_prs_tables.h"
 LOCATIONS = "ts38211_table_7_4_1_5_3_1_csirs_locations.json"
 CDM = "ts38211_tables_7_4_1_5_3_2_to_5_csirs_cdm_sequences.json"
 PRS = "ts38211_table_7_4_1_7_3_1_prs_kprime.json"
@@ -27,10 +23,6 @@ CDM_TYPES = ["noCDM", "fd-CDM2", "cdm4-FD2-TD2", "cdm8-FD2-TD4"]
 CDM_SIZES = [1, 2, 4, 8]
 MAX_ENTRIES = 16
 COMBS = [2, 4, 6, 12]
-
-
-def load(name):
-    return json.loads((DATA / name).read_text())
 
 
 def bitmap_rule(row):
@@ -167,11 +159,7 @@ inline constexpr std::array<std::array<int, 2>, {len(pairs)}> kPrsSymbolCombPair
 
 }}  // namespace Orvalis_NR::tables
 """
-    if "--check" in sys.argv:
-        if OUTPUT.read_text() != text:
-            raise SystemExit(f"{OUTPUT} differs from the generator's output")
-        return
-    OUTPUT.write_text(text)
+    emit(OUTPUT, text)
 
 
 if __name__ == "__main__":

@@ -13,13 +13,7 @@ the shape of each graph, the identity extension columns and the ascending TBS li
 Usage: tools/gen_ldpc_tables.py [--check]   (--check: fail when a committed header differs)
 """
 
-import json
-import pathlib
-import sys
-
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-DATA = ROOT / "data" / "3gpp"
-TABLES = ROOT / "src" / "tables"
+from table_generation import TABLES, emit, load
 
 LIFTING_FILE = "ts38212_table_5_3_2_1_ldpc_lifting_sizes.json"
 GRAPH_FILES = {1: "ts38212_table_5_3_2_2_ldpc_bg1.json", 2: "ts38212_table_5_3_2_3_ldpc_bg2.json"}
@@ -27,10 +21,6 @@ TBS_FILE = "ts38214_table_5_1_3_2_1_tbs.json"
 
 # (rows, columns, information columns, non-zero entries) of each base graph.
 GRAPH_SHAPE = {1: (46, 68, 22, 316), 2: (42, 52, 10, 197)}
-
-
-def load(name):
-    return json.loads((DATA / name).read_text())
 
 
 def lifting_sets():
@@ -187,17 +177,9 @@ def tbs_header():
 
 
 def main():
-    check = "--check" in sys.argv[1:]
     outputs = {TABLES / "ldpc_base_graphs.h": base_graphs_header(), TABLES / "tbs_table.h": tbs_header()}
-    stale = []
     for path, text in outputs.items():
-        if check:
-            if not path.exists() or path.read_text() != text:
-                stale.append(path)
-        else:
-            path.write_text(text)
-    if stale:
-        raise SystemExit("stale generated tables: " + ", ".join(str(p) for p in stale))
+        emit(path, text)
 
 
 if __name__ == "__main__":

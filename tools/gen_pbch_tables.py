@@ -6,12 +6,10 @@ Table: 7.1.1-1 (PBCH payload interleaver pattern G(j), 32 entries).
 Usage: tools/gen_pbch_tables.py [--check]   (--check: fail when the committed header differs)
 """
 
-import pathlib
+from gen_polar_tables import array_text, indexed_values
+from table_generation import TABLES, emit
 
-from gen_polar_tables import array_text, indexed_values, write_or_check
-
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-OUTPUT = ROOT / "src" / "tables" / "pbch_tables.h"
+OUTPUT = TABLES / "pbch_tables.h"
 SOURCE = "ts38212_table_7_1_1_1_pbch_payload_interleaver.json"
 
 
@@ -44,7 +42,7 @@ inline constexpr std::array<std::int8_t, 32> kPbchPayloadInterleaver = {{
 
 
 def main():
-    write_or_check(OUTPUT, render(), __file__)
+    emit(OUTPUT, render())
 
 
 if __name__ == "__main__":

@@ -9,21 +9,13 @@ TS 38.211 Table 7.4.1.2.2-1: PT-RS k_ref^RE, Rel-15 ports 1000..1005, 8 columns 
 Usage: tools/gen_pdsch_tables.py [--check]   (--check: fail when the committed header differs)
 """
 
-import json
-import pathlib
-import sys
+from table_generation import TABLES, emit, load
 
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-DATA = ROOT / "data" / "3gpp"
-OUTPUT = ROOT / "src" / "tables" / "pdsch_tables.h"
+OUTPUT = TABLES / "pdsch_tables.h"
 SINGLE = "ts38211_table_7_4_1_1_2_3_pdsch_dmrs_positions_single.json"
 DOUBLE = "ts38211_table_7_4_1_1_2_4_pdsch_dmrs_positions_double.json"
 PORTS = "ts38211_tables_dmrs_port_parameters.json"
 PTRS = "ts38211_table_7_4_1_2_2_1_ptrs_kref_dl.json"
-
-
-def load(name):
-    return json.loads((DATA / name).read_text())
 
 
 def positions(doc):
@@ -117,11 +109,7 @@ inline constexpr std::array<int, 48> kPtrsReferenceRe = {{
 
 }}  // namespace Orvalis_NR::tables
 """
-    if "--check" in sys.argv:
-        if OUTPUT.read_text() != text:
-            raise SystemExit(f"{OUTPUT} differs from the generator's output")
-        return
-    OUTPUT.write_text(text)
+    emit(OUTPUT, text)
 
 
 if __name__ == "__main__":

@@ -7,17 +7,12 @@ Tables: 5.3.1.1-1 (input bit interleaving pattern, 164 entries), 5.3.1.2-1 (pola
 Usage: tools/gen_polar_tables.py [--check]   (--check: fail when the committed header differs)
 """
 
-import json
-import pathlib
-import sys
-
-ROOT = pathlib.Path(__file__).resolve().parent.parent
-DATA = ROOT / "data" / "3gpp"
-OUTPUT = ROOT / "src" / "tables" / "polar_tables.h"
+from table_generation import TABLES, emit, load
+OUTPUT = TABLES / "polar_tables.h"
 
 
 def load_rows(name, width):
-    doc = json.loads((DATA / name).read_text())
+    doc = load(name)
     rows = doc["rows"]
     for row in rows:
         if len(row) != width or not all(isinstance(v, int) for v in row):
@@ -81,17 +76,10 @@ inline constexpr std::array<std::int8_t, 32> kPolarSubBlockPattern = {{
 """
 
 
-def write_or_check(output, text, script):
-    """Writes the header, or with --check fails when the committed one differs."""
-    if "--check" in sys.argv[1:]:
-        if output.read_text() != text:
-            raise SystemExit(f"{output} is out of date; run {pathlib.Path(script).name}")
-        return
-    output.write_text(text)
 
 
 def main():
-    write_or_check(OUTPUT, render(), __file__)
+    emit(OUTPUT, render())
 
 
 if __name__ == "__main__":

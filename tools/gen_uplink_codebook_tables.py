@@ -9,15 +9,11 @@ Usage: tools/gen_uplink_codebook_tables.py [--check]   (--check: fail when the c
 differs from what the data gives)
 """
 
-import json
 import math
-import pathlib
-import sys
 
-ROOT = pathlib.Path(__file__).resolve().parent.parent
+from table_generation import TABLES, emit, load
 SOURCE = "ts38211_tables_6_3_1_5_uplink_codebooks.json"
-DATA = ROOT / "data" / "3gpp" / SOURCE
-OUTPUT = ROOT / "src" / "tables" / "uplink_codebook_tables.h"
+OUTPUT = TABLES / "uplink_codebook_tables.h"
 UNITS = {"0": (0, 0), "1": (1, 0), "-1": (-1, 0), "j": (0, 1), "-j": (0, -1)}
 TRANSFORM_PRECODING = {"either": -1, "disabled": 0, "enabled": 1}
 MAX_ENTRIES = 16
@@ -40,7 +36,7 @@ def array_name(table):
 
 
 def main():
-    doc = json.loads(DATA.read_text())
+    doc = load(SOURCE)
     parts, index = [], []
     for table in doc["tables"]:
         tpmis = [e["tpmi"] for e in table["matrices"]]
@@ -85,11 +81,7 @@ inline constexpr std::array<UplinkCodebook, {len(index)}> kUplinkCodebooks = {{{
 
 }}  // namespace Orvalis_NR::tables
 """
-    if "--check" in sys.argv:
-        if not OUTPUT.exists() or OUTPUT.read_text() != text:
-            raise SystemExit(f"{OUTPUT} differs from the generator's output")
-        return
-    OUTPUT.write_text(text)
+    emit(OUTPUT, text)
 
 
 if __name__ == "__main__":
