@@ -86,11 +86,20 @@ cat > "$work/warn.json" <<'JSON'
 {"NRCarriers": [{"CarrierType": "DL", "Numerology": "SCS15k", "NumberOfRB": 11,
   "Downlink": {"BWP": [{"Numerology": "SCS15k", "RBNumber": 11}],
    "DLSCH": [{"BWPIndex": 0, "RBNumber": 11, "DMRSports": "0", "NumberOfLayers": 1, "NumberOfAntennaPorts": 1,
-              "SlotIndexArrayStr": "0", "MCS": 30}]}}]}
+              "SlotIndexArrayStr": "0", "MCS": 30, "TransportBlockSize": 1000, "Modulation": "QAM16", "CodingRate": 0.5}]}}]}
 JSON
 "$cli" validate "$work/warn.json" > "$work/out.txt"; rc=$?
 check "validate with warnings alone exits 0" test $rc -eq 0
 check "validate prints the warning" grep -q 'warning: NRCarriers\[0\].Downlink.DLSCH\[0\].MCS = 30' "$work/out.txt"
+
+# validate: a host value written in that contradicts its inputs; values left out are worked out
+sed 's/"MCS": 30, /"MCS": 9, /; s/, "Modulation": "QAM16", "CodingRate": 0.5//' "$work/warn.json" > "$work/tbs.json"
+"$cli" validate "$work/tbs.json" > "$work/out.txt"; rc=$?
+check "validate of a contradicting TransportBlockSize exits 1" test $rc -eq 1
+check "validate names the TransportBlockSize" grep -q 'error: NRCarriers\[0\].Downlink.DLSCH\[0\].TransportBlockSize = 1000: contradicts' "$work/out.txt"
+sed 's/"MCS": 30, .*}]}}]}/"MCS": 9}]}}]}/' "$work/warn.json" > "$work/tbs.json"
+"$cli" validate "$work/tbs.json" > /dev/null; rc=$?
+check "validate with the TransportBlockSize left out exits 0" test $rc -eq 0
 
 # generate: refuses a document with errors unless --force
 "$cli" generate "$work/cell.json" -o "$work/out/cell.bin" > "$work/gen.txt" 2>&1; rc=$?

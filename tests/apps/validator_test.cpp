@@ -205,6 +205,23 @@ const RuleCase kCases[] = {
          pusch(d)["NumberOfAntennaPorts"] = 2;
      },
      "NRCarriers[0].Uplink.ULSCH[0].NumberOfLayers", Severity::Error},
+    // Host values written in that contradict what they follow from. The base PDSCH worked by
+    // hand with TS 38.214 clause 5.1.3.2: 51 RBs x (12 x 12 - 6 DM-RS) = 7038 REs, MCS 5 of
+    // Table 5.1.3.1-1 (Qm 2, R 379/1024) gives N_info 5209.8, N'_info 5248 and TBS 5248.
+    {"TransportBlockSize the MCS gives", [](json& d) { pdsch(d)["TransportBlockSize"] = 5248; }, "", Severity::Error},
+    {"TransportBlockSize off by one", [](json& d) { pdsch(d)["TransportBlockSize"] = 5249; },
+     "NRCarriers[0].Downlink.DLSCH[0].TransportBlockSize", Severity::Error},
+    {"Modulation other than the MCS's", [](json& d) { pdsch(d)["Modulation"] = "QAM16"; },
+     "NRCarriers[0].Downlink.DLSCH[0].Modulation", Severity::Error},
+    {"CodingRate within half a 1024th", [](json& d) { pdsch(d)["CodingRate"] = 0.37; }, "", Severity::Error},
+    {"CodingRate other than the MCS's", [](json& d) { pdsch(d)["CodingRate"] = 0.5; },
+     "NRCarriers[0].Downlink.DLSCH[0].CodingRate", Severity::Warning},
+    {"Mu not matching Numerology", [](json& d) { bwp(d)["Mu"] = 0; }, "NRCarriers[0].Downlink.BWP[0].Mu", Severity::Error},
+    {"LastSymbol not first + number - 1", [](json& d) { pdsch(d)["LastSymbol"] = 12; },
+     "NRCarriers[0].Downlink.DLSCH[0].LastSymbol", Severity::Error},
+    {"SlotIndexArrayStr the expansion of SlotIndexStr", [](json& d) { pdsch(d)["SlotIndexStr"] = "0:1"; }, "", Severity::Error},
+    {"SlotIndexArrayStr not the expansion of SlotIndexStr", [](json& d) { pdsch(d)["SlotIndexStr"] = "0:2"; },
+     "NRCarriers[0].Downlink.DLSCH[0].SlotIndexArrayStr", Severity::Error},
     // Disabled items are not generated, so they are not checked.
     {"disabled PDSCH with a bad MCS", [](json& d) { pdsch(d)["MCS"] = 40; pdsch(d)["Enabled"] = false; }, "", Severity::Error},
 };

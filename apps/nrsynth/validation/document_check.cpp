@@ -2,6 +2,7 @@
 
 #include <memory>
 
+#include "derived_rules.h"
 #include "framework/json_serializer.h"
 #include "validator.h"
 
@@ -16,6 +17,8 @@ DocumentCheck checkDocument(const std::string& json) {
     for (const auto& issue : reader.getIssues()) check.readerProblems.push_back("wrong value: " + issue);
     if (const auto waveform = std::dynamic_pointer_cast<Models::Nr5g::NR5GWaveformSettings>(root))
         check.findings = validateWaveform(*waveform);
+    const auto document = nlohmann::ordered_json::parse(json, nullptr, false);
+    if (document.is_object()) checkDerivedValues(document, check.findings);
     return check;
 }
 

@@ -19,7 +19,8 @@ struct DocumentCheck {
     int warningCount() const { return findings.warningCount(); }
 };
 
-/// Checks a JSON text; throws std::exception when it is no JSON document at all.
+/// Checks a JSON text as the library would receive it (host values already worked out, or
+/// as-is); throws std::exception when it is no JSON document at all.
 DocumentCheck checkDocument(const std::string& json);
 
 /// The problems and findings, one per line, then "NAME: OK" or "NAME: E error(s), W warning(s)".
