@@ -114,6 +114,11 @@ const RuleCase kCases[] = {
      "NRCarriers[0].Downlink.DLSCH[0].RBGBitmap", Severity::Error},
     {"RBG bitmap of the 13 groups",
      [](json& d) { pdsch(d)["RAType"] = "RAType0"; pdsch(d)["RBGSize"] = 8; pdsch(d)["RBGBitmap"] = "1010101"; }, "", Severity::Error},
+    {"CSI-RS starting past its BWP",
+     [](json& d) { json c = csiRs(false); c["RBOffset"] = 51; carrier(d)["Downlink"]["CSIRS"] = json::array({c}); },
+     "NRCarriers[0].Downlink.CSIRS[0].RBOffset", Severity::Error},
+    {"CSI-RS wider than its BWP is cut at its edge",
+     [](json& d) { json c = csiRs(false); c["RBNumber"] = 272; carrier(d)["Downlink"]["CSIRS"] = json::array({c}); }, "", Severity::Error},
     {"downlink allocation type 2", [](json& d) { pdsch(d)["RAType"] = "RAType2"; }, "NRCarriers[0].Downlink.DLSCH[0].RAType", Severity::Error},
     // DM-RS, time allocation, ports and layers
     {"type A starting at symbol 4", [](json& d) { pdsch(d)["FirstSymbol"] = 4; pdsch(d)["SymbolNumber"] = 10; },
@@ -142,9 +147,9 @@ const RuleCase kCases[] = {
     {"port 2 with two CDM groups", [](json& d) { pdsch(d)["DMRSports"] = "2"; pdsch(d)["NumberOfDMRSCDMGroup"] = 2; }, "", Severity::Error},
     {"fewer antenna ports than layers",
      [](json& d) { pdsch(d)["NumberOfLayers"] = 2; pdsch(d)["DMRSports"] = "0,1"; pdsch(d)["AntennaPortArray"] = "1000"; },
-     "NRCarriers[0].Downlink.DLSCH[0].NumberOfAntennaPorts", Severity::Error},
+     "NRCarriers[0].Downlink.DLSCH[0].NumberOfAntennaPorts", Severity::Warning},
     {"AntennaPortArray count differs", [](json& d) { pdsch(d)["AntennaPortArray"] = "1000,1001"; },
-     "NRCarriers[0].Downlink.DLSCH[0].AntennaPortArray", Severity::Error},
+     "NRCarriers[0].Downlink.DLSCH[0].AntennaPortArray", Severity::Warning},
     {"two layers on two antennas",
      [](json& d) {
          pdsch(d)["NumberOfLayers"] = 2; pdsch(d)["DMRSports"] = "0,1"; pdsch(d)["NumberOfAntennaPorts"] = 2; pdsch(d)["AntennaPortArray"] = "1000,1001";

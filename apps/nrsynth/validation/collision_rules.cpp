@@ -34,6 +34,7 @@ struct Footprint {
 
 std::vector<int> commonRbs(const std::vector<int>& bwpRbs, const nr::NRDLBWP& bwp) {
     std::vector<int> rbs;
+    if (bwp.RBOffset->getValue() < 0 || bwp.RBOffset->getValue() > (1 << 20)) return rbs;  // the grid rules report it
     for (int rb : bwpRbs) rbs.push_back(rb + bwp.RBOffset->getValue());
     return rbs;
 }
@@ -133,7 +134,8 @@ DownlinkChannels collect(const CarrierRef& ref) {
         f.bwpIndex = csiRs.BWPIndex->getValue();
         f.slots = slotsOf(csiRs.SlotIndexArrayStr->getValue());
         f.symbols = csiRsSymbols(csiRs);
-        f.rbs = commonRbs(rangeOf(csiRs.RBOffset->getValue(), std::clamp(csiRs.RBNumber->getValue(), 0, 4096)), *bwp);
+        const int offset = csiRs.RBOffset->getValue();
+        f.rbs = commonRbs(rangeOf(offset, std::clamp(csiRs.RBNumber->getValue(), 0, std::max(0, bwp->RBNumber->getValue() - offset))), *bwp);
         f.antennas = antennaRows(csiRs.AntennaPortArray->getValue());
         f.perSlot = symbolsPerSlot(bwp->CPType->getValue());
         channels.csiRs.push_back(std::move(f));

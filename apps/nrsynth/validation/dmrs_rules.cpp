@@ -135,14 +135,16 @@ void checkPorts(const std::string& path, const nr::NRDLSCH& pdsch, int antennas,
                                " CDM groups are without data (TS 38.212 Tables 7.3.1.2.2-1 to -4)");
     }
 
+    // The mapping follows AntennaPortArray alone; NumberOfAntennaPorts only describes it, so a
+    // disagreement is worth a warning, not a refusal.
     const auto rows = antennaRows(pdsch.AntennaPortArray->getValue());
     const int antennaPorts = pdsch.NumberOfAntennaPorts->getValue();
     if (antennaPorts < layers)
-        findings.error(path + ".NumberOfAntennaPorts", std::to_string(antennaPorts),
-                       "at least one antenna port per layer: NumberOfLayers is " + std::to_string(layers));
-    if (static_cast<int>(rows.size()) != antennaPorts)
-        findings.error(path + ".AntennaPortArray", quoted(pdsch.AntennaPortArray->getValue()),
-                       "expected " + std::to_string(antennaPorts) + " ports (NumberOfAntennaPorts), one per antenna, -1 for none");
+        findings.warning(path + ".NumberOfAntennaPorts", std::to_string(antennaPorts),
+                         "at least one antenna port per layer: NumberOfLayers is " + std::to_string(layers));
+    else if (static_cast<int>(rows.size()) != antennaPorts)
+        findings.warning(path + ".AntennaPortArray", quoted(pdsch.AntennaPortArray->getValue()),
+                         "expected " + std::to_string(antennaPorts) + " ports (NumberOfAntennaPorts), one per antenna, -1 for none");
     if (!rows.empty() && rows.back() >= antennas)
         findings.warning(path + ".AntennaPortArray", quoted(pdsch.AntennaPortArray->getValue()),
                          "the waveform has " + std::to_string(antennas) +
@@ -192,7 +194,7 @@ void checkUplinkPorts(const std::string& path, const nr::NRULSCH& pusch, Finding
         findings.error(path + ".DMRSports", quoted(pusch.DMRSports->getValue()),
                        "expected one DM-RS port per layer: NumberOfLayers is " + std::to_string(layers));
     if (pusch.NumberOfAntennaPorts->getValue() < layers)
-        findings.error(path + ".NumberOfAntennaPorts", std::to_string(pusch.NumberOfAntennaPorts->getValue()),
+        findings.warning(path + ".NumberOfAntennaPorts", std::to_string(pusch.NumberOfAntennaPorts->getValue()),
                        "at least one antenna port per layer: NumberOfLayers is " + std::to_string(layers));
 }
 

@@ -24,8 +24,8 @@ namespace {
 /// Common RBs of the carrier in numerology `mu`: its resource grid of that µ when one is given,
 /// else its NumberOfRB counted from point A, scaled when the carrier has another numerology.
 struct CarrierSpan {
-    int first = 0;
-    int end = 0;  ///< one past the last RB
+    long long first = 0;
+    long long end = 0;  ///< one past the last RB
     std::string source;
 };
 
@@ -34,13 +34,13 @@ CarrierSpan carrierSpan(const nr::NRCarrier& carrier, int mu) {
     for (int g = 0; g < grids->getCount(); ++g) {
         const auto& grid = *grids->getItem(g);
         if (grid.Enabled->getValue() && grid.Mu->getValue() == mu && grid.N_grid_size->getValue() > 0)
-            return {grid.N_grid_start->getValue(), grid.N_grid_start->getValue() + grid.N_grid_size->getValue(),
+            return {grid.N_grid_start->getValue(), static_cast<long long>(grid.N_grid_start->getValue()) + grid.N_grid_size->getValue(),
                     "ResourceGrid[" + std::to_string(g) + "] (N_grid_start " + std::to_string(grid.N_grid_start->getValue()) +
                         ", N_grid_size " + std::to_string(grid.N_grid_size->getValue()) + ")"};
     }
     const int carrierMu = muOf(carrier.Numerology->getValue());
-    const int rbs = carrier.NumberOfRB->getValue();
-    const int scaled = mu >= carrierMu ? (rbs >> (mu - carrierMu)) : (rbs << (carrierMu - mu));
+    const long long rbs = std::max(carrier.NumberOfRB->getValue(), 0);
+    const long long scaled = mu >= carrierMu ? (rbs >> (mu - carrierMu)) : (rbs << (carrierMu - mu));
     return {0, scaled, "NumberOfRB " + std::to_string(rbs) + " of the carrier (" + std::to_string(scaled) + " RBs at mu " +
                            std::to_string(mu) + ")"};
 }
@@ -58,7 +58,7 @@ void checkBwp(const nr::NRCarrier& carrier, const Bwp& bwp, const std::string& p
         return;
     }
     const auto span = carrierSpan(carrier, muOf(bwp.Numerology->getValue()));
-    if (offset < span.first || offset + size > span.end)
+    if (offset < span.first || static_cast<long long>(offset) + size > span.end)
         findings.error(path + ".RBNumber", std::to_string(size),
                        "RBs " + std::to_string(offset) + " to " + std::to_string(offset + size - 1) +
                            " lie outside the carrier's common RBs " + std::to_string(span.first) + " to " +
@@ -76,6 +76,7 @@ std::pair<int, int> nominalRbgSizes(int bwpSize) {
 void checkRbgAllocation(const std::string& path, int rbgSize, const std::string& bitmap, const nr::NRDLBWP& bwp,
                         FindingList& findings) {
     const int bwpSize = bwp.RBNumber->getValue();
+    if (bwpSize < 1 || bwpSize > 275 || bwp.RBOffset->getValue() < 0) return;  // the bandwidth part's own rule reports it
     const auto [p1, p2] = nominalRbgSizes(bwpSize);
     if (rbgSize != p1 && rbgSize != p2) {
         findings.error(path + ".RBGSize", std::to_string(rbgSize),
@@ -101,7 +102,7 @@ void checkContiguous(const std::string& path, int offset, int count, int bwpSize
     if (offset < 0 || offset >= bwpSize)
         findings.error(path + ".RBOffset", std::to_string(offset),
                        "the first RB lies outside the bandwidth part's RBs 0 to " + std::to_string(bwpSize - 1));
-    else if (count < 1 || offset + count > bwpSize)
+    else if (count < 1 || static_cast<long long>(offset) + count > bwpSize)
         findings.error(path + ".RBNumber", std::to_string(count),
                        "from RBOffset " + std::to_string(offset) + " the bandwidth part of " + std::to_string(bwpSize) +
                            " RBs holds 1 to " + std::to_string(bwpSize - offset) + " RBs");
@@ -209,7 +210,11 @@ void checkDownlink(const CarrierRef& ref, FindingList& findings) {
             noBwp(path, csiRs.BWPIndex->getValue());
             continue;
         }
-        checkContiguous(path, csiRs.RBOffset->getValue(), csiRs.RBNumber->getValue(), bwp->RBNumber->getValue(), findings);
+        // A resource wider than the bandwidth part is cut at its edge (TS 38.211 clause 7.4.1.5.3).
+        const int offset = csiRs.RBOffset->getValue();
+        if (offset < 0 || offset >= bwp->RBNumber->getValue())
+            findings.error(path + ".RBOffset", std::to_string(offset),
+                           "the first RB lies outside the bandwidth part's RBs 0 to " + std::to_string(bwp->RBNumber->getValue() - 1));
     }
 }
 

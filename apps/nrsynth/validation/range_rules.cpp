@@ -71,7 +71,7 @@ void checkSymbols(const std::string& path, int first, int count, int perSlot, Fi
     if (first < 0 || first >= perSlot) {
         findings.error(path + ".FirstSymbol", std::to_string(first),
                        "a slot has symbols 0 to " + std::to_string(perSlot - 1));
-    } else if (count < 1 || first + count > perSlot) {
+    } else if (count < 1 || count > perSlot - first) {
         findings.error(path + ".SymbolNumber", std::to_string(count),
                        "from FirstSymbol " + std::to_string(first) + " the slot holds 1 to " +
                            std::to_string(perSlot - first) + " symbols");

@@ -39,7 +39,7 @@ int muOf(nr::Numerology numerology) {
 int symbolsPerSlot(nr::CyclicPrefixType cp) { return cp == nr::CyclicPrefixType::Extended ? 12 : 14; }
 
 int slotsInWaveform(const nr::NR5GWaveformSettings& waveform, int mu) {
-    return waveform.NumberOfFrames->getValue() * (10 << mu);
+    return std::clamp(waveform.NumberOfFrames->getValue(), 0, 1 << 16) * (10 << std::clamp(mu, 0, 4));
 }
 
 std::optional<std::vector<int>> intList(const std::string& text) {
@@ -80,6 +80,7 @@ int coresetFirstRb(const nr::NRCORESET& coreset, const nr::NRDLBWP& bwp) {
 
 std::vector<int> coresetRbs(const nr::NRCORESET& coreset, const nr::NRDLBWP& bwp) {
     const int start = coresetFirstRb(coreset, bwp);
+    if (start < -1 || start > (1 << 20)) return {start};  // far outside: its first RB tells the rule so
     if (coreset.ID->getValue() == 0 && bwp.InitialDLBWP->getValue())
         return rangeOf(start, std::clamp(coreset.RBNumber->getValue(), 0, 4096));
     std::vector<int> rbs;

@@ -27,7 +27,9 @@ std::vector<SsbBlock> ssbBlocks(const Models::Nr5g::NRSSPBCH& ssb, const Models:
     if (lmax < 1 || lmax > static_cast<int>(candidates.size())) return blocks;
     candidates.resize(static_cast<std::size_t>(lmax));
 
-    const int period = static_cast<int>(ssb.SSBPeriod->getValue());  // HalfFrame, OneFrame, 2, 4, 8, 16 frames
+    const int period = static_cast<int>(ssb.SSBPeriod->getValue());
+    const int halfFrameIndex = ssb.HalfFrameIndex->getValue();
+    if (halfFrameIndex < 0 || halfFrameIndex > 1) return blocks;  // no burst of the radio frame  // HalfFrame, OneFrame, 2, 4, 8, 16 frames
     const int halfFrame = 70 << mu;                                   // symbols of a half frame
     const int frameSymbols = 2 * halfFrame;
     const double scs = 15000.0 * std::ldexp(1.0, mu);
@@ -37,7 +39,7 @@ std::vector<SsbBlock> ssbBlocks(const Models::Nr5g::NRSSPBCH& ssb, const Models:
     for (int frame = 0; frame < frames; ++frame) {
         if (period >= 2 && frame % (1 << (period - 1)) != 0) continue;
         const int repeats = period == 0 ? 2 : 1;
-        const int offset = period == 0 ? 0 : halfFrame * ssb.HalfFrameIndex->getValue();
+        const int offset = period == 0 ? 0 : halfFrame * halfFrameIndex;
         for (int r = 0; r < repeats; ++r)
             for (int i = 0; i < lmax; ++i) {
                 const long long first = static_cast<long long>(frame) * frameSymbols + candidates[static_cast<std::size_t>(i)] +
