@@ -55,6 +55,27 @@ std::string logText() {
     return text;
 }
 
+/// True when a file can be made in `folder` (the probe is removed again).
+bool folderIsWritable(const std::filesystem::path& folder) {
+    const auto probe = folder / ".nrsynth_write_probe";
+    bool writable = false;
+    {
+        std::ofstream out(probe);
+        writable = static_cast<bool>(out);
+    }
+    std::error_code ignored;
+    std::filesystem::remove(probe, ignored);
+    return writable;
+}
+
+std::size_t countFiles(const std::filesystem::path& folder) {
+    std::size_t count = 0;
+    std::error_code error;
+    for (const auto& entry : std::filesystem::directory_iterator(folder, error))
+        if (entry.is_regular_file()) ++count;
+    return count;
+}
+
 bool step(const char* name) {
     const int status = GetStatus();
     if (status == 0) return true;
@@ -112,8 +133,14 @@ int generateWaveform(const GenerateOptions& options) {
 
     InitEngine(options.output.c_str());
     if (!step("InitEngine")) return 1;
+    // The library writes the export into DIR/Intermediate Data and creates nothing itself;
+    // the tool makes the folder for the user and tells where the files went.
+    std::filesystem::path exportFiles;
+    bool exportWritable = false;
     if (!options.exportFolder.empty()) {
-        std::filesystem::create_directories(options.exportFolder, ignored);
+        exportFiles = std::filesystem::path(options.exportFolder) / "Intermediate Data";
+        std::filesystem::create_directories(exportFiles, ignored);
+        exportWritable = folderIsWritable(exportFiles);
         std::vector<char> exportFolder(options.exportFolder.begin(), options.exportFolder.end());
         exportFolder.push_back('\0');
         InitTestVectorGenerator(true, exportFolder.data());
@@ -122,6 +149,13 @@ int generateWaveform(const GenerateOptions& options) {
     if (!step("RunEngine")) return 1;
 
     std::cout << logText() << "\nstatus " << GetStatus() << "\n";
+    if (!exportFiles.empty()) {
+        if (exportWritable)
+            std::printf("intermediate data: %zu files in %s\n", countFiles(exportFiles), exportFiles.string().c_str());
+        else
+            std::fprintf(stderr, "nrsynth generate: cannot write the intermediate data to %s: no export was made\n",
+                         exportFiles.string().c_str());
+    }
 
     // The summary reads the document again: the library keeps its tree to itself.
     Orvalis::Tessaline::JsonSerializer reader;

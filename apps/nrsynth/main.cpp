@@ -42,7 +42,7 @@ int main(int argc, char** argv) {
     generate->add_flag("--as-is", generateOptions.asIs,
                        "hand the document to the library as it stands, without working out the host values it "
                        "leaves out");
-    generate->add_option("--export", generateOptions.exportFolder, "folder for the intermediate data export (reserved: this version writes no export yet)");
+    generate->add_option("--export", generateOptions.exportFolder, "write every channel's stages of frame 0 as text files to DIR/Intermediate Data");
 
     CLI11_PARSE(app, argc, argv);
 

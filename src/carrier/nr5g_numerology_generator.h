@@ -48,6 +48,32 @@ public:
     /// Number of channel generators per place of `channelOrder`; a placeholder PBCH does not count.
     std::vector<int> countChannels() const;
 
+    // Copies of the stages that a channel item kept from its last slot, for the data export.
+    // `item` is the item's index in its generator vector; an index outside it fails.
+    void GetPDCCHBeforeCrc(int item, std::vector<char>& data);
+    void GetPDCCHAfterCrc(int item, std::vector<char>& data);
+    void GetPDCCHAfterPolar(int item, std::vector<char>& data);
+    void GetPDCCHAfterRateMatching(int item, std::vector<char>& data);
+    void GetPDCCHAfterMap(int item, std::vector<std::complex<double>>& data);
+    void GetPdcchDmrs(int item, std::vector<std::complex<double>>& data);
+    /// PDSCH stages of every code word in turn (the second follows the first).
+    void GetPDSCHBeforeCrc(int item, std::vector<char>& data);
+    void GetPDSCHAfterCrc(int item, std::vector<char>& data);
+    /// Output of the last code block encoded, -2 at the filler positions.
+    void GetPDSCHAfterLdpc(int item, std::vector<int>& data);
+    /// All code blocks' rate-matched (and bit-interleaved) outputs, joined.
+    void GetPDSCHAfterRateMatching(int item, std::vector<int>& data);
+    /// Modulated symbols in modulation order, before their split into layers.
+    void GetPDSCHAfterMap(int item, std::vector<std::complex<double>>& data);
+    /// DM-RS values of the slot: DM-RS symbol by symbol, port by port.
+    void GetPdschDmrs(int item, std::vector<std::complex<double>>& data);
+    void GetCsiRsSeqence(int item, std::vector<char>& data);
+    void GetCsiRsMapped(int item, std::vector<std::complex<double>>& data);
+    void GetPrsData(int item, std::vector<std::complex<double>>& data);
+    /// Row `antenna` of the frame store, and of the kept frame after the cyclic prefix.
+    void GetMuxOut(std::vector<std::complex<double>>& data, int antenna);
+    void GetCpAdded(std::vector<std::complex<double>>& data, int antenna);
+
     bool isPrimary = false;
     int numberOfAntennas = 0;
     bool hasValidChannel = false;

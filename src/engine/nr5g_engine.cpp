@@ -14,6 +14,7 @@
 #include "coding/table_edition.h"
 #include "common/failure.h"
 #include "common/sample_rate_guard.h"
+#include "engine/test_vector_generator.h"
 #include "framework/tools.h"
 
 namespace Orvalis_NR {
@@ -190,8 +191,12 @@ void NR5GEngine::selectTableEdition() {
     if (name.find("15.1") != std::string::npos) specVersion = 151;  // sticky for the process
 }
 
-void NR5GEngine::InitTestvectorGenerator(bool, char*) {
-    // The intermediate data export joins with its own generator; nothing to switch on yet.
+void NR5GEngine::InitTestvectorGenerator(bool enable, char* exportFolder) {
+    if (!enable) return;  // an earlier export stays on
+    if (!exportFolder) failWith("The export folder is missing.", "exportFolder null");
+    auto generator = std::make_unique<TestVectorGenerator>();
+    generator->Init(this, exportFolder);
+    testVectorGenerator = std::move(generator);
 }
 
 void NR5GEngine::Cancel() {
@@ -289,8 +294,12 @@ void NR5GEngine::Go() {
             if (!(offset >= 0.0) || offset > totalSamples)
                 failWith("TimingOffset out of range.", "NRCarriers[" + std::to_string(c) + "].TimingOffset " +
                                                            std::to_string(carrier->TimingOffset->getValue()));
-            generator->SetTestVector(false);
-            auto computeFrame = [&](int frame, bool secondPass) { generator->Go(frame, numberOfFrames, secondPass); };
+            generator->SetTestVector(testVectorGenerator != nullptr);
+            auto computeFrame = [&](int frame, bool secondPass) {
+                generator->Go(frame, numberOfFrames, secondPass);
+                // The stages of frame 0, before any of it is saved.
+                if (testVectorGenerator && frame == 0 && !secondPass) testVectorGenerator->GenerateOneFrame(c, frame);
+            };
             runCarrier(*generator, static_cast<int>(offset), computeFrame, true, firstCarrier);
             std::lock_guard<std::mutex> lock(generatorsMutex);
             generator.reset();

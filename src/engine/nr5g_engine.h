@@ -18,6 +18,7 @@ namespace Orvalis_NR {
 
 class NR5GCarrierGenerator;
 class AwgnGenerator;
+class TestVectorGenerator;
 
 /// Length of a waveform in samples, as the engine derives it from the settings.
 struct WaveformLength {
@@ -52,6 +53,8 @@ public:
     std::vector<FileBuffer> fileBuffers;
     std::vector<std::unique_ptr<NR5GCarrierGenerator>> carrierGenerators;
     std::unique_ptr<AwgnGenerator> noiseGenerator;
+    /// Present after InitTestvectorGenerator(true, ...): exports the stages of frame 0.
+    std::unique_ptr<TestVectorGenerator> testVectorGenerator;
     int numberOfCarriers = 0;
     char blankingMask = 0;
     int numberOfAntennas = 0;

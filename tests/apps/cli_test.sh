@@ -146,5 +146,23 @@ echo '{"NRCarriers": [{"Downlink": {"BWP": [{"Name": "BWP1"}], "DLSCH": [{"SlotI
 check "generate refuses a slot text it cannot expand" test $rc -eq 1
 check "generate names the slot text" grep -q 'DLSCH\[0\].SlotIndexStr: "4:2": "4:2" ends before it starts' "$work/gen.txt"
 
+# generate --export: the stages of frame 0 as text files in DIR/Intermediate Data
+cat > "$work/ssb.json" <<'JSON'
+{"SampleRateAuto": 30720000, "NumberOfFrames": 1, "PhaseCompensation": "Off",
+ "NRCarriers": [{"CarrierType": "DL", "Numerology": "SCS30k", "Mu": 1, "NumberOfRB": 51, "CellID": 7,
+   "FrequencyOffsetOfPointA": -9180000, "BasebandFilter": false,
+   "Downlink": {"SSPBCH": {"Enabled": true, "Numerology": "SCS30k", "Mu": 1, "SSBlockPattern": "CaseC",
+     "Lmax": 8, "PowerLevelStr": "1", "FrequencyOffset": -120}}}]}
+JSON
+"$cli" generate "$work/ssb.json" -o "$work/out/ssb.bin" --export "$work/tv" > "$work/gen.txt"; rc=$?
+check "generate --export exits 0" test $rc -eq 0
+check "generate --export says where the files are" grep -q "intermediate data: 10 files in $work/tv/Intermediate Data" "$work/gen.txt"
+check "generate --export writes the PBCH stages" test -s "$work/tv/Intermediate Data/DL_Tx_PBCH0_RM_Out.txt"
+check "generate --export writes the frame" test "$(wc -l < "$work/tv/Intermediate Data/DL_Tx_CPAdd_Ant0_CPAdd_Out.txt")" -eq 307200
+touch "$work/blocked"
+"$cli" generate "$work/ssb.json" -o "$work/out/ssb.bin" --export "$work/blocked/tv" > "$work/gen.txt" 2> "$work/err.txt"; rc=$?
+check "an unwritable export folder still gives the waveform" test $rc -eq 0 -a "$(stat -c %s "$work/out/ssb.bin")" -eq $((307200 * 16))
+check "an unwritable export folder is reported" grep -q "cannot write the intermediate data to $work/blocked/tv/Intermediate Data" "$work/err.txt"
+
 echo "cli: $failures failed"
 exit $((failures > 0))
