@@ -150,7 +150,7 @@ check "generate names the slot text" grep -q 'DLSCH\[0\].SlotIndexStr: "4:2": "4
 cat > "$work/ssb.json" <<'JSON'
 {"SampleRateAuto": 30720000, "NumberOfFrames": 1, "PhaseCompensation": "Off",
  "NRCarriers": [{"CarrierType": "DL", "Numerology": "SCS30k", "Mu": 1, "NumberOfRB": 51, "CellID": 7,
-   "FrequencyOffsetOfPointA": -9180000, "BasebandFilter": false,
+   "FrequencyOffsetOfPointA": -9180000, "BasebandFilter": false, "WindowBeta": 0,
    "Downlink": {"SSPBCH": {"Enabled": true, "Numerology": "SCS30k", "Mu": 1, "SSBlockPattern": "CaseC",
      "Lmax": 8, "PowerLevelStr": "1", "FrequencyOffset": -120}}}]}
 JSON

@@ -11,6 +11,7 @@
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
+#include <ostream>
 #include <set>
 #include <sstream>
 #include <string>
@@ -35,7 +36,8 @@ constexpr double kRate = 0.3;
 const std::string kPattern = "1011001110001011110100100001101101011100010010111101100";
 
 /// 51 RBs at 30 kHz and 30.72 MHz: SS/PBCH Case C, a DCI in a one-symbol CORESET and a 16QAM
-/// PDSCH on symbols 2..13 of slot 5.
+/// PDSCH on symbols 2..13 of slot 5. Without the window the symbols start exactly after their
+/// prefixes.
 nlohmann::json document(bool withChannels = true) {
     nlohmann::json coreset = {{"ID", 1},
                               {"SymbolNumber", 1},
@@ -72,7 +74,7 @@ nlohmann::json document(bool withChannels = true) {
     }
     nlohmann::json carrier = {{"CarrierType", "DL"}, {"Numerology", "SCS30k"}, {"Mu", 1},
                               {"NumberOfRB", 51},    {"CellID", kCellId},     {"FrequencyOffsetOfPointA", -51 * 6 * 30000.0},
-                              {"BasebandFilter", false}, {"Downlink", downlink}};
+                              {"BasebandFilter", false}, {"WindowBeta", 0.0}, {"Downlink", downlink}};
     auto waveform = nrsynth_test::waveform(30.72e6, 1, carrier);
     waveform["PhaseCompensation"] = "Off";  // the frame store and the samples differ by no rotation
     return waveform;
@@ -168,7 +170,7 @@ TEST_F(IntermediateExport, WritesOneFilePerStageOfEachChannelAndOfTheFrame) {
         for (const char* stage : {"_CRC_In", "_CRC_Out", "_Enc_Out", "_RM_Out", "_Mod_Out", "_DMRS"})
             expected.insert(std::string("DL_Tx_") + channel + stage + ".txt");
     EXPECT_EQ(filesIn(folder_->path() / "Intermediate Data"), expected);
-    EXPECT_EQ(filesIn(folder_->path()), (std::set<std::string>{"Intermediate Data", "wave.bin", "wave.mkr"}));
+    EXPECT_EQ(filesIn(folder_->path()), (std::set<std::string>{"Intermediate Data", "wave.bin", "wave.bin.mkr"}));
 }
 
 TEST_F(IntermediateExport, PbchStagesFollowTheCodingChainOfTheFirstBlock) {
@@ -235,7 +237,7 @@ TEST_F(IntermediateExport, PdschStagesFollowTheCodingChainOfTheTransportBlock) {
     for (int i = 0; i < kTbs; ++i)
         ASSERT_EQ(a[static_cast<std::size_t>(i)], kPattern[static_cast<std::size_t>(i) % kPattern.size()] - '0') << i;
     auto tb = a;
-    const auto crc = pdsch_rx::crc(a, 24, pdsch_rx::kCrc24A);
+    const auto crc = pdsch_rx::crc(a, 16, pdsch_rx::kCrc16);  // CRC16 up to 3824 bits
     tb.insert(tb.end(), crc.begin(), crc.end());
     EXPECT_EQ(readIntegers(file("DL_Tx_PDSCH0_CRC_Out.txt")), tb);
 
@@ -310,8 +312,9 @@ TEST_F(IntermediateExport, MultiplexedFrameIsTheDemodulatedFrameBeforeFiltering)
 struct FolderCase {
     const char* name;
     bool call, enable;
-    const char* suffix;      // appended to the scratch folder
+    const char* suffix;  // appended to the scratch folder
     bool filesExpected;
+    friend void PrintTo(const FolderCase& c, std::ostream* os) { *os << c.name; }
 };
 
 class ExportFolder : public ::testing::TestWithParam<FolderCase> {};
@@ -337,7 +340,7 @@ TEST_P(ExportFolder, WritesTheExportOnlyWhereAsked) {
     } else {
         EXPECT_TRUE(files.empty());
     }
-    EXPECT_EQ(filesIn(folder.path()), (std::set<std::string>{"export", "wave.bin", "wave.mkr"}));
+    EXPECT_EQ(filesIn(folder.path()), (std::set<std::string>{"export", "wave.bin", "wave.bin.mkr"}));
 }
 
 INSTANTIATE_TEST_SUITE_P(Cases, ExportFolder,
