@@ -3,11 +3,13 @@
 
 #include <benchmark/benchmark.h>
 
+#include <cstdint>
 #include <random>
 #include <vector>
 
 #include "coding/ldpc_encoder.h"
 #include "coding/ldpc_rate_match.h"
+#include "coding/ldpc_symbol_rate_match.h"
 
 namespace {
 
@@ -85,5 +87,39 @@ void BM_LdpcRateMatch_BG1_Z384(benchmark::State& state) {
         benchmark::Counter::kIsRate);
 }
 BENCHMARK(BM_LdpcRateMatch_BG1_Z384)->Arg(2)->Arg(6)->Arg(8);
+
+// The shared channel's form: one BG1 Z 384 block with 200 fillers, rv 0, E 9120 at the given Qm,
+// rate matched straight into symbol indices; beside it the bit form at the same E.
+void rateMatchE9120(benchmark::State& state, bool symbols) {
+    const int qm = static_cast<int>(state.range(0));
+    Orvalis_NR::LDPC_Encoder encoder;
+    encoder.Initialize(0, 384);
+    auto in = randomBits(static_cast<std::size_t>(encoder.K), 3);
+    const int kPrime = encoder.K - 200;
+    for (int i = kPrime; i < encoder.K; ++i) in[static_cast<std::size_t>(i)] = -2;
+    std::vector<int> d(static_cast<std::size_t>(encoder.N));
+    encoder.Run(in, d);
+    const int e = 9120 / qm * qm;
+    Orvalis_NR::LDPC_RateMatch rm;
+    rm.Initialize(LDPC_BG1, 384, 1, encoder.N, encoder.N, e, 0, qm);
+    std::vector<int> f(static_cast<std::size_t>(e));
+    Orvalis_NR::LdpcSymbolRateMatch fast;
+    const Orvalis_NR::LdpcCircularBuffer buffer{d.data(), encoder.N, rm.K0, kPrime - 768, encoder.K - 768};
+    std::vector<std::uint16_t> out(static_cast<std::size_t>(e / qm));
+    for (auto _ : state) {
+        if (symbols) fast.run(buffer, e, qm, out.data());
+        else rm.Run(d, f);
+        benchmark::DoNotOptimize(out.data());
+        benchmark::DoNotOptimize(f.data());
+        benchmark::ClobberMemory();
+    }
+    state.counters["out_Mbit/s"] = benchmark::Counter(
+        static_cast<double>(e) * static_cast<double>(state.iterations()) / 1e6,
+        benchmark::Counter::kIsRate);
+}
+void BM_LdpcRateMatchE9120_Bits(benchmark::State& s) { rateMatchE9120(s, false); }
+void BM_LdpcRateMatchE9120_Symbols(benchmark::State& s) { rateMatchE9120(s, true); }
+BENCHMARK(BM_LdpcRateMatchE9120_Bits)->Arg(8);
+BENCHMARK(BM_LdpcRateMatchE9120_Symbols)->Arg(2)->Arg(4)->Arg(6)->Arg(8);
 
 }  // namespace

@@ -93,8 +93,17 @@ void NR5GNumerologyGenerator::GetPDSCHAfterLdpc(int item, std::vector<int>& data
 
 void NR5GNumerologyGenerator::GetPDSCHAfterRateMatching(int item, std::vector<int>& data) {
     data.clear();
-    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords)
-        data.insert(data.end(), cw.CodedBits.begin(), cw.CodedBits.end());
+    const auto& pdsch = itemOf(pdschGenerators, item, "PDSCH");
+    for (const auto& cw : pdsch.CodeWords) {
+        if (!pdsch.CodingOn) {
+            data.insert(data.end(), cw.CodedBits.begin(), cw.CodedBits.end());
+            continue;
+        }
+        // Coded bits travel as symbols of Qm bits, the first in bit 0.
+        const auto qm = static_cast<std::size_t>(cw.Qm);
+        const auto g = std::min(static_cast<std::size_t>(std::max(cw.G, 0LL)), cw.CodedSymbols.size() * qm);
+        for (std::size_t k = 0; k < g; ++k) data.push_back((cw.CodedSymbols[k / qm] >> (k % qm)) & 1);
+    }
 }
 
 void NR5GNumerologyGenerator::GetPDSCHAfterMap(int item, std::vector<std::complex<double>>& data) {

@@ -68,6 +68,26 @@ struct GoldRegisters {
             count -= k;
         }
     }
+
+    // Writes `count` further output bits packed 64 to a word, the first in bit 0.
+    void emitWords(std::uint64_t* out, long long count) {
+        std::uint64_t word = 0;
+        int fill = 0;
+        while (count > 0) {
+            const int k = count < kStride ? static_cast<int>(count) : kStride;
+            const std::uint64_t bits = output(k);
+            advance(k);
+            count -= k;
+            word |= bits << fill;
+            fill += k;
+            if (fill >= 64) {
+                *out++ = word;
+                fill -= 64;
+                word = fill > 0 ? bits >> (k - fill) : 0;
+            }
+        }
+        if (fill > 0) *out = word;
+    }
 };
 
 // The common run: `warmUp` silent steps (may be negative), then n outputs of which those at
@@ -98,4 +118,15 @@ bool PN_Generator(BitSequence& c, int n, int cInit, int offset) {
     if (n + warmUp < 1) return true;
     runGold(c.data(), n, cInit, warmUp);
     return true;
+}
+
+void PN_GeneratorWords(std::vector<std::uint64_t>& words, int n, int cInit) {
+    if (n <= 0) return;
+    const std::size_t need = (static_cast<std::size_t>(n) + 63) / 64;
+    if (words.size() < need)
+        throw std::out_of_range("PN_GeneratorWords: words holds " + std::to_string(words.size()) +
+                                " words, n is " + std::to_string(n));
+    GoldRegisters reg(cInit);
+    reg.skip(kNc);
+    reg.emitWords(words.data(), n);
 }

@@ -3,6 +3,7 @@
 // (TS 38.211 clauses 7.3.1.1-7.3.1.3), then the slot's DM-RS and PT-RS sequences.
 
 #include <algorithm>
+#include <cstdint>
 
 #include "coding/crc.h"
 #include "coding/gold_sequence.h"
@@ -15,14 +16,6 @@ namespace {
 constexpr int kCrc16 = 0x1021;
 constexpr int kCrc24A = 0x864CFB;
 constexpr int kCrc24B = 0x800063;
-
-/// TS 38.212 clause 5.4.2.2 bit interleaving for any Qm: f(i + j Qm) = e(i E/Qm + j).
-void interleaveBits(const std::vector<int>& e, std::vector<int>& f, int qm) {
-    const int rows = static_cast<int>(e.size()) / qm;
-    for (int j = 0; j < rows; ++j)
-        for (int i = 0; i < qm; ++i)
-            f[static_cast<std::size_t>(i + j * qm)] = e[static_cast<std::size_t>(i * rows + j)];
-}
 
 }  // namespace
 
@@ -62,23 +55,54 @@ void PDSCH_Generator::encodeCodeWord(SchCodeWord& cw) {
 
         const int e = coded < static_cast<int>(cw.PerBlockE.size()) ? cw.PerBlockE[static_cast<std::size_t>(coded)] : 0;
         ++coded;
-        if (e <= 0 || out + static_cast<std::size_t>(e) > cw.CodedBits.size()) continue;
-        // The rate matcher knows the interleaver for Qm 1, 2, 4, 6 and 8; 8PSK and 1024QAM take
-        // the same clause with their own Qm.
+        if (e <= 0 || static_cast<long long>(out) + e > cw.G) continue;
+        // The rate matcher checks the geometry and gives k0; 8PSK and 1024QAM pass Qm 1 to it,
+        // as it knows only the square constellations' interleavers.
         const bool ownInterleaver = cw.Qm == 3 || cw.Qm == 10;
         cw.RateMatch.Initialize(cw.BaseGraph != 1 ? LDPC_BG2 : LDPC_BG1, cw.Z, c, std::min(cw.Nref, cw.N), cw.N, e,
                                 cw.Rv, ownInterleaver ? 1 : cw.Qm);
-        cw.RateMatched.resize(static_cast<std::size_t>(e));
-        cw.RateMatch.Run(cw.EncoderOut, cw.RateMatched);
-        if (ownInterleaver) {
-            cw.Interleaved.resize(static_cast<std::size_t>(e));
-            interleaveBits(cw.RateMatched, cw.Interleaved, cw.Qm);
-            std::copy(cw.Interleaved.begin(), cw.Interleaved.end(), cw.CodedBits.begin() + static_cast<std::ptrdiff_t>(out));
-        } else {
-            std::copy(cw.RateMatched.begin(), cw.RateMatched.end(), cw.CodedBits.begin() + static_cast<std::ptrdiff_t>(out));
-        }
+        // The encoder output drops the first 2Z systematic bits; the fillers follow K'.
+        LdpcCircularBuffer buffer;
+        buffer.D = cw.EncoderOut.data();
+        buffer.Ncb = cw.RateMatch.Ncb;
+        buffer.K0 = cw.RateMatch.K0;
+        buffer.FillerBegin = kPrime - 2 * cw.Z;
+        buffer.FillerEnd = cw.K - 2 * cw.Z;
+        cw.SymbolRateMatch.run(buffer, e, cw.Qm, cw.CodedSymbols.data() + out / static_cast<std::size_t>(cw.Qm));
         out += static_cast<std::size_t>(e);
     }
+}
+
+// Modulation and layer mapping (TS 38.211 clauses 7.3.1.2 and 7.3.1.3): symbol L i + j goes to
+// layer j at position i. Coded symbols are scrambled here, Qm bits of the Gold sequence at once.
+void PDSCH_Generator::modulateAndMapLayers(SchCodeWord& cw, bool scrambled) {
+    const int qm = cw.Qm;
+    const std::size_t l = cw.Layers.size();
+    const std::size_t r = l == 0 ? 0 : cw.Layers[0].size();
+    const unsigned mask = (1u << qm) - 1u;
+    const complex* table = cw.SymbolTable.data();
+    std::size_t s = 0;
+    if (!scrambled) {
+        const int* bits = cw.CodedBits.data();
+        for (std::size_t i = 0; i < r; ++i)
+            for (std::size_t j = 0; j < l; ++j, ++s) {
+                unsigned index = 0;
+                for (int b = 0; b < qm; ++b) index |= static_cast<unsigned>(bits[s * qm + b] & 1) << b;
+                cw.Layers[j][i] = table[index];
+            }
+        return;
+    }
+    const std::uint16_t* symbols = cw.CodedSymbols.data();
+    const std::uint64_t* pn = cw.PnWords.data();
+    std::size_t bit = 0;
+    for (std::size_t i = 0; i < r; ++i)
+        for (std::size_t j = 0; j < l; ++j, ++s, bit += static_cast<std::size_t>(qm)) {
+            const std::size_t word = bit >> 6;
+            const unsigned shift = static_cast<unsigned>(bit & 63u);
+            std::uint64_t c = pn[word] >> shift;
+            if (shift + static_cast<unsigned>(qm) > 64u) c |= pn[word + 1] << (64u - shift);
+            cw.Layers[j][i] = table[(symbols[s] ^ static_cast<unsigned>(c)) & mask];
+        }
 }
 
 bool PDSCH_Generator::Generate(int frame, int subframe, int slot) {
@@ -93,30 +117,17 @@ bool PDSCH_Generator::Generate(int frame, int subframe, int slot) {
     }
 
     const int cInit = static_cast<int>((static_cast<long long>(Rnti) << 15) + NId);
-    const int l = NumberOfLayers / NumberOfCodewords;
     for (auto& cw : CodeWords) {
-        const std::size_t g = cw.CodedBits.size();
         if (!CodingOn) {
-            cw.Source->GetOneFrame(cw.CodedBits, static_cast<int>(g));
-            std::copy(cw.CodedBits.begin(), cw.CodedBits.end(), cw.ScrambledBits.begin());
+            cw.Source->GetOneFrame(cw.CodedBits, static_cast<int>(cw.CodedBits.size()));
+            modulateAndMapLayers(cw, false);
         } else {
             encodeCodeWord(cw);
             // TS 38.211 clause 7.3.1.1 with the code word term q 2^14 left out.
-            cw.PnBits.resize(g);
-            PN_Generator(cw.PnBits, static_cast<int>(g), cInit);
-            for (std::size_t i = 0; i < g; ++i)
-                cw.ScrambledBits[i] = (cw.CodedBits[i] ^ cw.PnBits[i]) & 1;
+            const std::size_t used = cw.Layers.size() * (cw.Layers.empty() ? 0 : cw.Layers[0].size());
+            PN_GeneratorWords(cw.PnWords, static_cast<int>(used) * cw.Qm, cInit);
+            modulateAndMapLayers(cw, true);
         }
-        // Modulation and layer mapping: symbol L i + j goes to layer j at position i.
-        const int qm = cw.Qm;
-        const std::size_t r = cw.Layers.empty() ? 0 : cw.Layers[0].size();
-        std::size_t bit = 0;
-        for (std::size_t i = 0; i < r; ++i)
-            for (int j = 0; j < l; ++j) {
-                unsigned index = 0;
-                for (int b = 0; b < qm; ++b) index = (index << 1) | static_cast<unsigned>(cw.ScrambledBits[bit++] & 1);
-                cw.Layers[static_cast<std::size_t>(j)][i] = cw.Constellation[index];
-            }
     }
     if (HighestPrb >= LowestPrb) generateDmrs(subframe, slot);
     return true;

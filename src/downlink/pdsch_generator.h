@@ -6,6 +6,7 @@
 // 7.4.1.2) into the frame store.
 
 #include <array>
+#include <cstdint>
 #include <atomic>
 #include <memory>
 #include <string>
@@ -14,6 +15,7 @@
 #include "coding/coding_types.h"
 #include "coding/ldpc_encoder.h"
 #include "coding/ldpc_rate_match.h"
+#include "coding/ldpc_symbol_rate_match.h"
 #include "downlink/csi_rs_footprint.h"
 #include "downlink/precoding_matrix.h"
 #include "dsp/slot_grid.h"
@@ -43,13 +45,15 @@ struct SchCodeWord {
     BitSequence CbCrc;
     BitSequence CbBits;
     std::vector<int> EncoderOut;
-    std::vector<int> RateMatched;
-    BitSequence PnBits;
-    std::vector<int> CodedBits;
-    std::vector<int> ScrambledBits;
+    LdpcSymbolRateMatch SymbolRateMatch;
+    std::vector<int> CodedBits;                ///< G payload bits when channel coding is off
+    std::vector<std::uint16_t> CodedSymbols;   ///< G / Qm symbols of coded bits, first bit in bit 0
+    std::vector<std::uint64_t> PnWords;        ///< G scrambling bits, packed, first in bit 0
     std::vector<std::vector<complex>> Layers;  ///< one vector of R symbols per layer
     std::vector<complex> Constellation;        ///< indexed by the bits, first bit most significant
+    std::vector<complex> SymbolTable;          ///< the same points indexed first bit least significant
     int TbsBits = 0;         ///< A
+    long long G = 0;         ///< coded bits of the slot
     int Blocks = 0;          ///< C
     int Z = 0;
     int TbWithCrcBits = 0;   ///< B
@@ -64,7 +68,6 @@ struct SchCodeWord {
     int TbCrcBits = 0;
     int BaseGraph = 1;  ///< 1 or 2
     int Modulation = 0;
-    std::vector<int> Interleaved;  ///< work area of the bit interleaver for Qm 3 and 10
     std::vector<int> EncoderIn;    ///< K encoder inputs, -2 for a filler
 };
 
@@ -204,6 +207,7 @@ class PDSCH_Generator {
     bool ssbHit(int prb, int symbolInFrame, int firstOfSlot, int lastOfSlot) const;
     void generateDmrs(int subframe, int slot);
     void encodeCodeWord(SchCodeWord& cw);
+    void modulateAndMapLayers(SchCodeWord& cw, bool scrambled);
     int portGroupOffset(int port) const;
     bool readSlot(int entry, int frame, SlotPlace& place) const;
     const std::vector<complex>* portLayer(int position) const;

@@ -3,6 +3,7 @@
 // channel holds in the occupancy grid is respected RE by RE.
 
 #include <algorithm>
+#include <array>
 
 #include "downlink/pdsch_generator.h"
 
@@ -101,6 +102,47 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
     layers_.assign(Ports.size(), nullptr);
     for (std::size_t x = 0; x < Ports.size(); ++x) layers_[x] = portLayer(static_cast<int>(x));
 
+    // One RB of a data-only symbol without precoding: the rules of mapElement, with a whole-RB
+    // copy where no earlier channel holds any of its elements.
+    auto mapPlainDataRb = [this](std::size_t line, int prb) {
+        std::array<std::size_t, 12> at{};
+        for (int j = 0; j < 12; ++j) {
+            int column = 12 * prb + j + PointAOffset;
+            if (column < 0) column += GridWidth;
+            else if (column >= GridWidth) column -= GridWidth;
+            at[static_cast<std::size_t>(j)] = line + static_cast<std::size_t>(column);
+        }
+        const bool contiguous = at[11] == at[0] + 11;
+        for (auto& row : rows_) {
+            const auto* layer = layers_[static_cast<std::size_t>(row.position)];
+            const std::size_t available = layer ? layer->size() : 0;
+            if (contiguous && row.read + 12 <= available) {
+                int* o = row.occupancy + at[0];
+                int taken = 0;
+                for (int j = 0; j < 12; ++j) taken |= o[j];
+                if (taken == 0) {  // the common case: nothing else in this RB
+                    complex* v = row.values + at[0];
+                    const complex* from = layer->data() + row.read;
+                    for (int j = 0; j < 12; ++j) {
+                        v[j] = from[j] * DataAmplitude;
+                        o[j] = kData;
+                    }
+                    row.read += 12;
+                    continue;
+                }
+            }
+            for (std::size_t j = 0; j < 12; ++j) {
+                int& o = row.occupancy[at[j]];
+                if (o == 0) {
+                    if (row.read < available) row.values[at[j]] = (*layer)[row.read++] * DataAmplitude;
+                    o = kData;
+                } else if (o != kDmrs && o != kPtrs && o != kCdmReserved && !isSsb(o)) {
+                    o = kData;
+                }
+            }
+        }
+    };
+
     for (int entry : SlotList) {
         if (CancelRequested.load(std::memory_order_relaxed)) break;
         SlotPlace place;
@@ -136,6 +178,8 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
             e.dmrsIndex = dmrsIndex < static_cast<int>(DmrsValues.size()) ? dmrsIndex : -1;
             const bool symbolHit = std::find(RmCoresetSymbols.begin(), RmCoresetSymbols.end(), s) != RmCoresetSymbols.end();
             const std::size_t line = static_cast<std::size_t>(f + s) * width;
+            // Data alone on an unprecoded symbol: each row takes its layer RB by RB.
+            const bool plainData = !precoded && cls == 2;
             int rbCounter = 0;
             for (int n = AllocRbStart; n < AllocRbStart + AllocRbCount; ++n) {
                 if (!RbMask[static_cast<std::size_t>(n)]) continue;
@@ -145,6 +189,10 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
                 ++rbCounter;
                 if (RmCoreset && slotHit && symbolHit && coresetHit(p)) continue;
                 if (precoded) CalculatePrecodingMatrix(p);
+                if (plainData) {
+                    mapPlainDataRb(line, p);
+                    continue;
+                }
                 e.prb = p;
                 e.ptrsRb = isPtrs && (rbIndex - PtrsRbOffset) % KPtrs == 0;
                 for (int j = 0; j < 12; ++j) {

@@ -161,10 +161,14 @@ void PDSCH_Generator::CalculateRateMathingParameters(int frame, int subframe, in
     const int l = y / w;
     for (auto& cw : CodeWords) {
         const long long g = static_cast<long long>(cw.Qm) * y * r / w;
-        cw.CodedBits.assign(static_cast<std::size_t>(g), 0);
-        cw.ScrambledBits.assign(static_cast<std::size_t>(g), 0);
+        cw.G = g;
+        if (!CodingOn) cw.CodedBits.assign(static_cast<std::size_t>(g), 0);
+        // Blocks left out (CBG) keep coded bits 0.
+        cw.CodedSymbols.assign(static_cast<std::size_t>((g + cw.Qm - 1) / cw.Qm), 0);
+        cw.PnWords.resize(static_cast<std::size_t>((g + 63) / 64));
+        // Generate writes every symbol of every layer.
         cw.Layers.resize(static_cast<std::size_t>(l));
-        for (auto& layer : cw.Layers) layer.assign(static_cast<std::size_t>(r), complex{});
+        for (auto& layer : cw.Layers) layer.resize(static_cast<std::size_t>(r));
         if (!CodingOn) continue;
         std::fill(cw.PerBlockE.begin(), cw.PerBlockE.end(), 0);
         const int coded = CodedBlocks;

@@ -157,11 +157,9 @@ void PDSCH_Generator::reserveSlotStorage() {
     const std::size_t maxRe = static_cast<std::size_t>(AllocRbCount) * 12 * DataSymbols.size();
     for (auto& cw : CodeWords) {
         const std::size_t maxBits = maxRe * static_cast<std::size_t>(cw.Qm) * static_cast<std::size_t>(NumberOfLayers);
-        cw.CodedBits.reserve(maxBits);
-        cw.ScrambledBits.reserve(maxBits);
-        cw.PnBits.reserve(maxBits);
-        cw.RateMatched.reserve(maxBits);
-        cw.Interleaved.reserve(maxBits);
+        if (!CodingOn) cw.CodedBits.reserve(maxBits);
+        cw.CodedSymbols.reserve(maxBits / static_cast<std::size_t>(cw.Qm) + 1);
+        cw.PnWords.reserve(maxBits / 64 + 1);
         cw.EncoderIn.reserve(static_cast<std::size_t>(cw.K));
         cw.Layers.reserve(8);
         for (auto& layer : cw.Layers) layer.reserve(maxRe);
@@ -367,6 +365,12 @@ void PDSCH_Generator::buildCodeWords(NRCarrier* carrier) {
         GetPdschConstellation(cw.Modulation, cw.Qm, cw.Constellation);
         if (cw.Constellation.empty())
             failWith("PDSCH Modulation is not a known constellation.", named(Settings, "Modulation", cw.Modulation));
+        cw.SymbolTable.resize(cw.Constellation.size());
+        for (std::size_t i = 0; i < cw.SymbolTable.size(); ++i) {
+            std::size_t msbFirst = 0;
+            for (int b = 0; b < cw.Qm; ++b) msbFirst |= ((i >> b) & 1u) << (cw.Qm - 1 - b);
+            cw.SymbolTable[i] = cw.Constellation[msbFirst];
+        }
         cw.Layers.resize(static_cast<std::size_t>(NumberOfLayers / NumberOfCodewords));
         if (!CodingOn) continue;
 

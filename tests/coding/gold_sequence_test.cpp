@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <random>
+#include <vector>
 
 namespace {
 
@@ -30,10 +32,17 @@ BitSequence referenceGold(long long cInit, long long offset, int n) {
 TEST(GoldSequence, MatchesRegisterReference) {
     std::mt19937 rng(2024u);
     for (int cInit : {0, 1, 0x7FFFFFFF, static_cast<int>(0x92345678u)}) {
-        for (int n : {1, 27, 28, 29, 56, 57, 1001}) {
+        for (int n : {1, 27, 28, 29, 56, 57, 63, 64, 65, 1001}) {
             BitSequence c(static_cast<std::size_t>(n), 9);
             PN_Generator(c, n, cInit);
             ASSERT_EQ(c, referenceGold(cInit, 0, n)) << "cInit=" << cInit << " n=" << n;
+            // The packed form: the same bits, 64 to a word, and nothing past n.
+            std::vector<std::uint64_t> words(static_cast<std::size_t>((n + 63) / 64), ~0ull);
+            PN_GeneratorWords(words, n, cInit);
+            for (int i = 0; i < 64 * static_cast<int>(words.size()); ++i)
+                ASSERT_EQ((words[static_cast<std::size_t>(i / 64)] >> (i % 64)) & 1u,
+                          i < n ? static_cast<unsigned>(c[static_cast<std::size_t>(i)]) : 0u)
+                    << "cInit=" << cInit << " n=" << n << " bit " << i;
         }
     }
     for (int trial = 0; trial < 40; ++trial) {
@@ -53,6 +62,8 @@ TEST(GoldSequence, SizeAndRangeRules) {
     EXPECT_EQ(c, BitSequence(10, 9));
     BitSequence small(3);
     EXPECT_THROW(PN_Generator(small, 4, 1), std::out_of_range);
+    std::vector<std::uint64_t> word(1);
+    EXPECT_THROW(PN_GeneratorWords(word, 65, 1), std::out_of_range);
 }
 
 }  // namespace

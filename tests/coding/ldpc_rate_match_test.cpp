@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cmath>
+#include <cstdint>
 #include <random>
 #include <stdexcept>
 #include <string>
@@ -11,6 +12,7 @@
 #include <vector>
 
 #include "coding/ldpc_encoder.h"
+#include "coding/ldpc_symbol_rate_match.h"
 #include "test_support.h"
 #include "vector_file.h"
 
@@ -77,6 +79,50 @@ INSTANTIATE_TEST_SUITE_P(AllRvAndQm, LdpcRateMatchDirect,
                          ::testing::Combine(::testing::Values(0, 1), ::testing::Range(0, 4),
                                             ::testing::Values(1, 2, 4, 6, 8)));
 
+// (base graph index, rv, Qm): the symbol form against the clause for every modulation order,
+// 8PSK and 1024QAM included.
+class LdpcSymbolRateMatchDirect : public ::testing::TestWithParam<std::tuple<int, int, int>> {};
+
+// Fillers inside and at the end of limited buffers, k0 inside the filler run, outputs of
+// lengths that are not whole words, shorter than the buffer and wrapping it.
+TEST_P(LdpcSymbolRateMatchDirect, SymbolsCarryTheInterleavedBits) {
+    const auto [bg, rv, qm] = GetParam();
+    const int z = bg == 0 ? 26 : 36;
+    Orvalis_NR::LDPC_Encoder encoder;
+    ASSERT_TRUE(encoder.Initialize(bg, z));
+    std::mt19937 rng(static_cast<unsigned>(300 + 100 * bg + 10 * rv + qm));
+    Orvalis_NR::LdpcSymbolRateMatch fast;
+    for (int kPrime : {encoder.K, encoder.K - 5 * z - 3, 2 * z + 1}) {
+        auto info = randomBits<int>(static_cast<std::size_t>(encoder.K), rng);
+        for (int i = kPrime; i < encoder.K; ++i) info[static_cast<std::size_t>(i)] = -2;
+        std::vector<int> d(static_cast<std::size_t>(encoder.N));
+        ASSERT_TRUE(encoder.Run(info, d));
+        const int n = encoder.N;
+        for (int ncb : {n, encoder.K - 2 * z - 1, kPrime - 2 * z + 3}) {
+            for (int symbols : {1, 7, 8, 9, 333, (2 * ncb) / qm + 5}) {
+                const int e = symbols * qm;
+                SCOPED_TRACE("K' " + std::to_string(kPrime) + " Ncb " + std::to_string(ncb) + " E " + std::to_string(e));
+                const auto f = directRateMatch(d, bg, z, ncb, e, rv, qm, std::vector<int>(static_cast<std::size_t>(e)));
+                LDPC_RateMatch geometry;  // k0 from the direct form's table, qm only for the check
+                ASSERT_TRUE(geometry.Initialize(bg == 0 ? LDPC_BG1 : LDPC_BG2, z, 1, ncb, n, e, rv, 1));
+                Orvalis_NR::LdpcCircularBuffer buffer{d.data(), ncb, geometry.K0, kPrime - 2 * z, encoder.K - 2 * z};
+                std::vector<std::uint16_t> out(static_cast<std::size_t>(symbols) + 1, 0xFFFF);
+                fast.run(buffer, e, qm, out.data());
+                for (int j = 0; j < symbols; ++j) {
+                    unsigned expected = 0;
+                    for (int i = 0; i < qm; ++i) expected |= static_cast<unsigned>(f[static_cast<std::size_t>(j * qm + i)]) << i;
+                    ASSERT_EQ(out[static_cast<std::size_t>(j)], expected) << "symbol " << j;
+                }
+                EXPECT_EQ(out.back(), 0xFFFF);  // nothing past the last symbol
+            }
+        }
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(AllRvAndQm, LdpcSymbolRateMatchDirect,
+                         ::testing::Combine(::testing::Values(0, 1), ::testing::Range(0, 4),
+                                            ::testing::Values(1, 2, 3, 4, 6, 8, 10)));
+
 TEST(LdpcRateMatch, Refusals) {
     LDPC_RateMatch rm;
     EXPECT_FALSE(rm.Initialize(LDPC_BG1, 384, 1, 25344, 25344, 100, 4, 6));  // rv
@@ -88,6 +134,12 @@ TEST(LdpcRateMatch, Refusals) {
     // A buffer of fillers is reported instead of looping forever; Ncb above N at set-up.
     d.assign(100, -2);
     EXPECT_EQ(failureText([&] { rm.Run(d, f); }),
+              "The LDPC circular buffer holds only filler bits: the selection would never end. "
+              "Ncb 100");
+    Orvalis_NR::LdpcSymbolRateMatch fast;
+    std::vector<std::uint16_t> symbols(5);
+    const Orvalis_NR::LdpcCircularBuffer fillers{d.data(), 100, 30, 0, 100};
+    EXPECT_EQ(failureText([&] { fast.run(fillers, 10, 2, symbols.data()); }),
               "The LDPC circular buffer holds only filler bits: the selection would never end. "
               "Ncb 100");
     EXPECT_EQ(failureText([&] { rm.Initialize(LDPC_BG2, 2, 1, 120, 100, 10, 0, 2); }),

@@ -234,7 +234,10 @@ TEST(PdschCodeBlockGroups, RateMatchOnlyTheFlaggedBlocks) {
 
     g.Generate(0, 0, 0);
     const auto& cw = g.CodeWords[0];
-    const int bits = static_cast<int>(cw.CodedBits.size());
+    const int bits = static_cast<int>(cw.G);
+    // Coded bits travel as symbols of Qm bits, the first in bit 0.
+    std::vector<int> coded(static_cast<std::size_t>(bits));
+    for (std::size_t k = 0; k < coded.size(); ++k) coded[k] = (cw.CodedSymbols[k / kQm] >> (k % kQm)) & 1;
     EXPECT_EQ(bits, kQm * 52 * (13 * 12 + 6));
     // TS 38.212 clause 5.4.2.1 with C' = 3: E_r = Qm floor(G / (Qm C')) for the first
     // C' - (G / Qm mod C') blocks, Qm ceil(...) for the rest.
@@ -258,8 +261,8 @@ TEST(PdschCodeBlockGroups, RateMatchOnlyTheFlaggedBlocks) {
         const auto blockCrc = pdsch_rx::crc(info, 24, pdsch_rx::kCrc24B);
         info.insert(info.end(), blockCrc.begin(), blockCrc.end());
         const int e = expectedE[static_cast<std::size_t>(r - 2)];
-        const pdsch_rx::Bits f(cw.CodedBits.begin() + static_cast<std::ptrdiff_t>(offset),
-                               cw.CodedBits.begin() + static_cast<std::ptrdiff_t>(offset) + e);
+        const pdsch_rx::Bits f(coded.begin() + static_cast<std::ptrdiff_t>(offset),
+                               coded.begin() + static_cast<std::ptrdiff_t>(offset) + e);
         offset += static_cast<std::size_t>(e);
         const auto check = pdsch_rx::checkBlock(pdsch_rx::deinterleave(f, kQm), info, seg.graph, seg.z, 66 * seg.z);
         EXPECT_EQ(check.systematicErrors, 0);

@@ -77,14 +77,18 @@ TEST_P(PdschTransportBlockVector, CodedAndScrambledBitsEqualTheVector) {
     EXPECT_GE(cw.Nref, v.number("Ncb")) << "a limited buffer would cut the circular buffer";
 
     gen.Generate(0, 0, 0);
-    ASSERT_EQ(static_cast<int>(cw.CodedBits.size()), g);
+    ASSERT_EQ(cw.G, g);
     std::string e;
     for (int x : cw.PerBlockE) e += (e.empty() ? "" : ",") + std::to_string(x);
     EXPECT_EQ(e, v.values.at("E_list"));
     std::string tb, coded, scrambled;
     for (int i = 0; i < a; ++i) tb += static_cast<char>('0' + cw.TbBits[static_cast<std::size_t>(i)]);
-    for (int bit : cw.CodedBits) coded += static_cast<char>('0' + bit);
-    for (int bit : cw.ScrambledBits) scrambled += static_cast<char>('0' + bit);
+    // Coded bits travel as symbols of Qm bits and the scrambling sequence as packed words.
+    for (std::size_t k = 0; k < static_cast<std::size_t>(g); ++k) {
+        const unsigned bit = (cw.CodedSymbols[k / static_cast<std::size_t>(qm)] >> (k % static_cast<std::size_t>(qm))) & 1u;
+        coded += static_cast<char>('0' + bit);
+        scrambled += static_cast<char>('0' + (bit ^ ((cw.PnWords[k / 64] >> (k % 64)) & 1u)));
+    }
     EXPECT_EQ(tb, v.tb);
     EXPECT_TRUE(coded == v.coded) << "coded bits differ from bit " << std::mismatch(coded.begin(), coded.end(), v.coded.begin(), v.coded.end()).first - coded.begin();
     EXPECT_TRUE(scrambled == v.scrambled) << "scrambled bits differ from bit "
