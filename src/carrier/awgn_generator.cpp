@@ -7,6 +7,7 @@
 
 #include "dsp/filter.h"
 #include "dsp/sinc_low_pass.h"
+#include "dsp/ziggurat_normal.h"
 #include "common/failure.h"
 #include "common/sample_rate_guard.h"
 
@@ -41,7 +42,7 @@ void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWavefor
     const auto design = Generate_SincLowPass(x, 1024, 1, true);
     std::vector<std::complex<double>> coefficients(design.begin(), design.end());
     noiseFilters.clear();
-    for (int a = 0; a < numberOfAntennas; ++a) noiseFilters.push_back(FilterCreator::create(coefficients, 7000));
+    for (int a = 0; a < numberOfAntennas; ++a) noiseFilters.push_back(FilterCreator::createForFrames(coefficients));
 
     frameLength = std::min(static_cast<int>(rate) / 100, totalSamples);
     const auto rows = static_cast<std::size_t>(std::max(numberOfAntennas, 0));
@@ -58,9 +59,7 @@ void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWavefor
 
 void AwgnGenerator::GoAwgn(int frame, int, bool secondPass, bool noiseOnly) {
     std::mt19937 engine;  // default seed 5489 unless reseeded below
-    // A ratio so high that sigma underflows to 0 means no noise (the distribution needs sigma > 0).
-    std::normal_distribution<double> normal(0.0, sigma > 0.0 ? sigma : 1.0);
-    const double scale = sigma > 0.0 ? 1.0 : 0.0;
+    const ZigguratNormal& normal = zigguratNormal();
     if (secondPass) {
         engine.seed(seed);
     } else if (frame == 0) {
@@ -72,8 +71,8 @@ void AwgnGenerator::GoAwgn(int frame, int, bool secondPass, bool noiseOnly) {
     for (std::size_t a = 0; a < rawNoise.size(); ++a) {
         auto& raw = rawNoise[a];
         for (int i = 0; i < frameLength; ++i) {
-            const double inPhase = normal(engine) * scale;
-            const double quadrature = normal(engine) * scale;
+            const double inPhase = normal(engine) * sigma;
+            const double quadrature = normal(engine) * sigma;
             raw[static_cast<std::size_t>(i)] = {inPhase, quadrature};
         }
         previousSamples[a].swap(currentSamples[a]);

@@ -72,6 +72,10 @@ void FFT::InverseFFT(const double* in, double* out, std::complex<double> factor)
     ready(state, "FFT").inverseTimes(in, out, factor);
 }
 
+void FFT::InverseFFTUnscaled(const double* in, double* out) {
+    ready(state, "FFT").executeUnscaled(true, in, out);
+}
+
 DFT::DFT() = default;
 DFT::~DFT() = default;
 DFT::DFT(DFT&& other) noexcept
@@ -112,6 +116,10 @@ void DFT::InverseDFT(const double* in, double* out) {
 
 void DFT::InverseDFT(const double* in, double* out, std::complex<double> factor) {
     ready(state, "DFT").inverseTimes(in, out, factor);
+}
+
+void DFT::InverseDFTUnscaled(const double* in, double* out) {
+    ready(state, "DFT").executeUnscaled(true, in, out);
 }
 
 }  // namespace Orvalis_NR

@@ -30,6 +30,8 @@ class FFT {
     void InverseFFT(const double* in, double* out);
     /// InverseFFT times `factor`, in one pass over the result.
     void InverseFFT(const double* in, double* out, std::complex<double> factor);
+    /// N times InverseFFT: the caller applies 1/N in a pass it makes anyway.
+    void InverseFFTUnscaled(const double* in, double* out);
 
     /// Length given to Init, 0 before.
     int size() const { return length; }
@@ -57,6 +59,8 @@ class DFT {
     void ForwardDFT(const double* in, double* out);
     void InverseDFT(const double* in, double* out);
     void InverseDFT(const double* in, double* out, std::complex<double> factor);
+    /// N times InverseDFT.
+    void InverseDFTUnscaled(const double* in, double* out);
 
     int size() const { return length; }
 

@@ -22,6 +22,9 @@ class FftwTransform {
     void execute(bool inverse, const double* in, double* out);
     /// Inverse transform, divided by the length and multiplied by `factor`, in one pass.
     void inverseTimes(const double* in, double* out, std::complex<double> factor);
+    /// The transform alone, the inverse not divided by the length: for callers that fold the
+    /// scaling into a pass of their own.
+    void executeUnscaled(bool inverse, const double* in, double* out) { transform(inverse, in, out); }
 
     int length() const { return length_; }
 

@@ -6,6 +6,30 @@
 
 namespace Orvalis_NR {
 
+namespace {
+
+// Shortest transform createForFrames uses: below it the per-block copies outweigh the saving.
+constexpr int kShortestFrameTransform = 1024;
+
+// The inverse transform without its 1/N, where `transform` is the library's own; false for any
+// other implementation.
+bool inverseUnscaled(Dft& transform, std::complex<double>* data) {
+    auto* own = dynamic_cast<IppDft*>(&transform);
+    if (own == nullptr) return false;
+    auto* values = reinterpret_cast<double*>(data);
+    if (own->fftTransform) {
+        own->fftTransform->InverseFFTUnscaled(values, values);
+        return true;
+    }
+    if (own->dftTransform) {
+        own->dftTransform->InverseDFTUnscaled(values, values);
+        return true;
+    }
+    return false;
+}
+
+}  // namespace
+
 void Filter::filter(gsl::span<std::complex<double>> in, gsl::span<std::complex<double>> out) {
     filter(in.data(), gsl::narrow<int>(in.size()), out.data(), gsl::narrow<int>(out.size()));
 }
@@ -59,6 +83,13 @@ void Fir::filter(const std::complex<double>* in, int inLength, std::complex<doub
         spectrum.assign(static_cast<std::size_t>(size), {});
         std::copy(coefficients.begin(), coefficients.end(), spectrum.begin());
         transform->dft(spectrum.data(), spectrum.data());
+        // The inverse's 1/N moves into the spectrum (exact for a power of two), which saves a
+        // pass over every block.
+        spectrumScaled = dynamic_cast<IppDft*>(transform.get()) != nullptr;
+        if (spectrumScaled) {
+            const double scale = 1.0 / static_cast<double>(size);
+            for (auto& value : spectrum) value *= scale;
+        }
         work.assign(static_cast<std::size_t>(size), {});
         spectrumSize = size;
     }
@@ -79,7 +110,7 @@ void Fir::filter(const std::complex<double>* in, int inLength, std::complex<doub
 
     transform->dft(work.data(), work.data());
     for (int i = 0; i < size; ++i) work[i] *= spectrum[i];
-    transform->idft(work.data(), work.data());
+    if (!spectrumScaled || !inverseUnscaled(*transform, work.data())) transform->idft(work.data(), work.data());
     std::copy(work.begin(), work.begin() + length, out);
 }
 
@@ -115,6 +146,17 @@ std::shared_ptr<BlockFilter> FilterCreator::create(std::vector<std::complex<doub
     auto transform = std::make_shared<IppDft>(length);
     auto fir = std::make_shared<Fir>(std::move(transform), std::move(coefficients));
     return std::make_shared<BlockFilter>(std::move(fir), effectiveBlock);
+}
+
+std::shared_ptr<BlockFilter> FilterCreator::createForFrames(std::vector<std::complex<double>> coefficients) {
+    if (coefficients.empty()) throw std::invalid_argument("coeff");
+    const int count = static_cast<int>(coefficients.size());
+    // FFTW's estimated plans lose speed per point beyond a few thousand points, while a block
+    // much shorter than the filter wastes the transform on history: about twice the filter wins.
+    const int length = std::max(kShortestFrameTransform, overlapSaveLength(2LL * (count - 1)));
+    if (length - count + 1 < 1) return create(std::move(coefficients), count);  // beyond the longest transform
+    auto fir = std::make_shared<Fir>(std::make_shared<IppDft>(length), std::move(coefficients));
+    return std::make_shared<BlockFilter>(std::move(fir), length - count + 1);
 }
 
 }  // namespace Orvalis_NR

@@ -61,7 +61,8 @@ class Fir : public BasicFir {
     std::vector<std::complex<double>> work;
 
   private:
-    int spectrumSize = 0;  // transform size `spectrum` was made for
+    int spectrumSize = 0;         // transform size `spectrum` was made for
+    bool spectrumScaled = false;  // `spectrum` carries the inverse's 1/N
 };
 
 /// Cuts its input into pieces of at most blockSize samples for the inner filter.
@@ -88,6 +89,10 @@ struct FilterCreator {
     /// power-of-two transform. coefficients: at least one ("coeff" otherwise).
     static std::shared_ptr<BlockFilter> create(std::vector<std::complex<double>> coefficients,
                                                int blockSize);
+    /// The same convolution for frame-long rows, with the transform length and block that cost
+    /// least per output sample: a power of two of about twice the coefficient count, each block
+    /// filling the transform. coefficients: at least one ("coeff" otherwise).
+    static std::shared_ptr<BlockFilter> createForFrames(std::vector<std::complex<double>> coefficients);
 };
 
 /// Transform length for overlap-save of `needed` = block + M - 1 samples: the first power of two

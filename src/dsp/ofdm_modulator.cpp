@@ -118,27 +118,24 @@ bool OfdmModulator::Go(SlotGrid& grid, std::vector<std::vector<std::complex<doub
                         grid[a].data() + static_cast<std::size_t>(s) * fftSize;
                     if (dcPunctured) symbol[0] = 0.0;
                     const auto* in = reinterpret_cast<const double*>(symbol);
+                    // Unscaled: the 1/N rides on the copy into the output.
+                    if (fft.size() > 0)
+                        fft.InverseFFTUnscaled(in, workData);
+                    else
+                        dft.InverseDFTUnscaled(in, workData);
                     if (phaseStep != 0.0) {
                         // Rotate so that the useful part starts with the phase a carrier at the
-                        // compensation frequency has there (TS 38.211 clause 5.4). The rotation
-                        // rides on the inverse transform's 1/N pass.
+                        // compensation frequency has there (TS 38.211 clause 5.4).
                         const std::uint32_t start = rowLength * static_cast<std::uint32_t>(frame) +
                                                     static_cast<std::uint32_t>(position);
                         const auto offset = static_cast<std::int32_t>(
                             static_cast<std::uint32_t>(-static_cast<std::int64_t>(cp)) - start);
                         const double x = static_cast<double>(offset) * phaseStep;
-                        const std::complex<double> rotation(std::cos(x), std::sin(x));
-                        if (fft.size() > 0)
-                            fft.InverseFFT(in, workData, rotation);
-                        else
-                            dft.InverseDFT(in, workData, rotation);
-                    } else if (fft.size() > 0) {
-                        fft.InverseFFT(in, workData);
+                        writeSymbol(row + position, tails[a], cp,
+                                    std::complex<double>(std::cos(x), std::sin(x)) / static_cast<double>(fftSize));
                     } else {
-                        dft.InverseDFT(in, workData);
+                        writeSymbol(row + position, tails[a], cp, 1.0 / static_cast<double>(fftSize));
                     }
-
-                    writeSymbol(row + position, tails[a], cp);
                     position += (fftSize + cp) * oversampling;
                 }
             }
@@ -147,8 +144,9 @@ bool OfdmModulator::Go(SlotGrid& grid, std::vector<std::vector<std::complex<doub
     return false;
 }
 
-void OfdmModulator::writeSymbol(std::complex<double>* out, std::vector<std::complex<double>>& tail,
-                                int cp) {
+template <class Factor>
+void OfdmModulator::writeSymbol(std::complex<double>* out, std::vector<std::complex<double>>& tail, int cp,
+                                Factor factor) {
     const int n = fftSize;
     const int w = windowLength;
     const int h = centred ? w / 2 : 0;
@@ -159,26 +157,27 @@ void OfdmModulator::writeSymbol(std::complex<double>* out, std::vector<std::comp
     // (exactly so for power-of-two lengths).
     int p = n - h - cp;
     const int mask = n - 1;
+    const auto scaled = [factor](std::complex<double> value) { return value * factor; };
     for (int i = 0; i < w; ++i, ++p)
-        out[i] = tail[i] * (1.0 - window[i]) + source[p & mask] * window[i];
+        out[i] = tail[i] * (1.0 - window[i]) + scaled(source[p & mask]) * window[i];
     int written = w;
     if (p < n) {
         const int count = std::min(n - p, total - written);
-        std::copy(source + p, source + p + count, out + written);
+        std::transform(source + p, source + p + count, out + written, scaled);
         written += count;
         p = 0;
     } else {
         p -= n;
     }
-    std::copy(source + p, source + p + (total - written), out + written);
+    std::transform(source + p, source + p + (total - written), out + written, scaled);
 
     // The tail is this symbol's own cyclic continuation past its last output sample.
     if (centred) {
         const int half = w / 2;
-        std::copy(source + n - half, source + n, tail.begin());
-        std::copy(source, source + (w - half), tail.begin() + half);
+        std::transform(source + n - half, source + n, tail.begin(), scaled);
+        std::transform(source, source + (w - half), tail.begin() + half, scaled);
     } else {
-        std::copy(source, source + w, tail.begin());
+        std::transform(source, source + w, tail.begin(), scaled);
     }
 }
 

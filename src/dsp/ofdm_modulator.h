@@ -52,7 +52,10 @@ class OfdmModulator {
   private:
     void checkBuffers(const SlotGrid& grid,
                       const std::vector<std::vector<std::complex<double>>>& output) const;
-    void writeSymbol(std::complex<double>* out, std::vector<std::complex<double>>& tail, int cp);
+    /// Writes the symbol in `work` times `factor` (the 1/N of the inverse transform, with the
+    /// phase compensation when there is one) while copying it out.
+    template <class Factor>
+    void writeSymbol(std::complex<double>* out, std::vector<std::complex<double>>& tail, int cp, Factor factor);
 };
 
 }  // namespace Orvalis_NR

@@ -45,6 +45,7 @@ struct Form {
 
 const Form kForms[] = {
     {"Created", [](const Samples& c, int block) { return FilterCreator::create(c, block); }},
+    {"CreatedForFrames", [](const Samples& c, int) { return FilterCreator::createForFrames(c); }},
     {"BasicFir", [](const Samples& c, int) { return std::make_shared<BasicFir>(c); }},
     {"BlockOverBasicFir",
      [](const Samples& c, int block) {
@@ -87,7 +88,7 @@ TEST_P(FilterAgainstConvolution, CallsInSequenceEqualOneConvolution) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Cases, FilterAgainstConvolution,
-                         ::testing::Combine(::testing::Range(0, 3),
+                         ::testing::Combine(::testing::Range(0, 4),
                                             ::testing::ValuesIn(kFilterCases)),
                          [](const auto& info) {
                              return std::string(kForms[std::get<0>(info.param)].name) + "_" +
@@ -98,6 +99,7 @@ INSTANTIATE_TEST_SUITE_P(Cases, FilterAgainstConvolution,
 TEST(FilterFailures, AreInvalidArguments) {
     Samples x(20), y(20);
     EXPECT_THROW(FilterCreator::create({}, 7000), std::invalid_argument);
+    EXPECT_THROW(FilterCreator::createForFrames({}), std::invalid_argument);
     EXPECT_THROW(Fir(std::make_shared<IppDft>(4), Samples(5)), std::invalid_argument);
     Fir fir(std::make_shared<IppDft>(16), Samples(5, Complex(1.0)));
     EXPECT_THROW(fir.filter(x.data(), 13, y.data(), 13), std::invalid_argument);  // 13 + 4 > 16

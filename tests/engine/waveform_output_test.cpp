@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "dsp/sinc_low_pass.h"
+#include "dsp/ziggurat_normal.h"
 #include "output_files.h"
 #include "waveform_test_support.h"
 
@@ -151,10 +152,10 @@ TEST_F(WaveformOutput, NoiseOnlyIsTheCircularlyFilteredNoiseWithFullMarkers) {
     for (int frame = 0; frame < 2; ++frame) {
         std::mt19937 engine;
         if (frame == 0) engine.seed(seed);
-        std::normal_distribution<double> normal(0.0, sigma);
+        const auto& normal = Orvalis_NR::zigguratNormal();
         for (std::size_t i = 0; i < frameLength; ++i) {
-            const double re = normal(engine);
-            raw.emplace_back(re, normal(engine));
+            const double re = normal(engine) * sigma;
+            raw.emplace_back(re, normal(engine) * sigma);
         }
     }
     const auto taps = Generate_SincLowPass(x, 1024, 1, true);
