@@ -10,6 +10,7 @@
 
 #include <benchmark/benchmark.h>
 #include <fftw3.h>
+#include <malloc.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -166,8 +167,10 @@ double statusBytes(const std::string& field) {
     return 0.0;
 }
 
-// Restarts the resident high-water mark (Linux 4.0 and later); false where not allowed.
+// Returns freed heap to the system and restarts the resident high-water mark (Linux 4.0 and
+// later), so that the next peak is the run's own; false where not allowed.
 bool resetPeak() {
+    malloc_trim(0);
     std::ofstream clear("/proc/self/clear_refs");
     clear << "5";
     return static_cast<bool>(clear.flush());

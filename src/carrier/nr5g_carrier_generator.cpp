@@ -121,15 +121,22 @@ void NR5GCarrierGenerator::addNumerology(NR5GNumerologyGenerator& numerology, bo
                 frameRow[wrap(startSample + j)] += frameRow[wrap(static_cast<long>(outputLength) + startSample + j)];
         }
         auto& current = currentSamples[static_cast<std::size_t>(a)];
-        for (int k = 0; k < outputLength - delay; ++k) {
-            const auto value = frameRow[wrap(static_cast<long>(startSample) + delay + k)];
-            if (first)
-                current[static_cast<std::size_t>(k)] = value;
-            else
-                current[static_cast<std::size_t>(k)] += value;
+        auto& previous = previousSamples[static_cast<std::size_t>(a)];
+        // Source index startSample + delay + k, wrapped once at the frame's end.
+        const int head = std::min(outputLength - delay, std::max(0, frameLength - startSample - delay));
+        const auto* unwrapped = frameRow.data() + startSample + delay;
+        const auto* wrapped = frameRow.data() + (static_cast<long>(startSample) + delay + head) % frameLength;
+        if (first) {
+            std::copy(unwrapped, unwrapped + head, current.begin());
+            std::copy(wrapped, wrapped + (outputLength - delay - head), current.begin() + head);
+            // The rows were swapped, not copied: the end that only later numerologies add to
+            // keeps what it held after the last frame.
+            std::copy(previous.begin() + (outputLength - delay), previous.end(), current.begin() + (outputLength - delay));
+        } else {
+            for (int k = 0; k < head; ++k) current[static_cast<std::size_t>(k)] += unwrapped[k];
+            for (int k = head; k < outputLength - delay; ++k) current[static_cast<std::size_t>(k)] += wrapped[k - head];
         }
         // The head of this frame finishes the previous one.
-        auto& previous = previousSamples[static_cast<std::size_t>(a)];
         for (int j = 0; j < delay; ++j) previous[static_cast<std::size_t>(outputLength - delay + j)] += frameRow[wrap(startSample + j)];
     }
 }
@@ -159,8 +166,9 @@ void NR5GCarrierGenerator::rotate(std::vector<std::complex<double>>& row, double
 void NR5GCarrierGenerator::Go(int frame, int numberOfFrames, bool secondPass) {
     for (int a = 0; a < numberOfAntennas; ++a) {
         const auto row = static_cast<std::size_t>(a);
-        previousSamples[row] = currentSamples[row];
-        previousMarkers[row] = currentMarkers[row];
+        // Swapped rather than copied; addNumerology restores what the first numerology leaves.
+        previousSamples[row].swap(currentSamples[row]);
+        previousMarkers[row].swap(currentMarkers[row]);
         std::fill(currentMarkers[row].begin(), currentMarkers[row].end(), 0);
         std::fill(sampleMarkers[row].begin(), sampleMarkers[row].end(), 0);
     }
@@ -176,6 +184,9 @@ void NR5GCarrierGenerator::Go(int frame, int numberOfFrames, bool secondPass) {
         addNumerology(numerology, firstWithContent);
         firstWithContent = false;
     }
+    if (firstWithContent)  // nothing was added: the frame being built stays as it was
+        for (int a = 0; a < numberOfAntennas; ++a)
+            currentSamples[static_cast<std::size_t>(a)] = previousSamples[static_cast<std::size_t>(a)];
     if (takeCancel()) return;
 
     if (carrier->CarrierType->getValue() == CarrierType::CW) {

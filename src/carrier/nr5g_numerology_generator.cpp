@@ -126,6 +126,7 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
     grid.assign(rows, std::vector<std::complex<double>>(elements));
     occupancy.assign(rows, std::vector<int>(elements));
     symbolMarks.assign(rows, std::vector<int>(static_cast<std::size_t>(symbolsPerFrame)));
+    storesClear = true;  // assigned zero just now: the first frame need not clear them again
     Log("End Init OFDM");
 
     filters.clear();
@@ -286,7 +287,7 @@ void NR5GNumerologyGenerator::designFilter() {
         const double h = prototype[static_cast<std::size_t>(i)] * gain;
         coefficients[static_cast<std::size_t>(i)] = {std::cos(phase) * h, std::sin(phase) * h};
     }
-    for (int a = 0; a < numberOfAntennas; ++a) filters.push_back(FilterCreator::create(coefficients, 7000));
+    for (int a = 0; a < numberOfAntennas; ++a) filters.push_back(FilterCreator::createForFrames(coefficients));
 }
 
 std::vector<int> NR5GNumerologyGenerator::countChannels() const {
@@ -426,17 +427,28 @@ void NR5GNumerologyGenerator::deriveMarkers(const std::vector<std::vector<int>>&
         if (words.empty()) continue;
         const std::size_t length = words.size();
         std::size_t pos = 0;
+        // ORs `bits` into samples i of the symbol starting at `pos`, from <= i < to, wrapping at
+        // the row's end.
+        const auto mark = [&](int from, int to, int bits) {
+            std::size_t at = (pos + static_cast<std::size_t>(from)) % length;
+            for (int i = from; i < to; ++i) {
+                words[at] |= bits;
+                if (++at == length) at = 0;
+            }
+        };
         for (int s = 0; s < symbolsPerFrame; ++s) {
             const int symbolLength = cpLengths[static_cast<std::size_t>(s % cpCount)] + fftSize;
             const int flag = flags[static_cast<std::size_t>(s)];
             const bool previous = flags[static_cast<std::size_t>((s + symbolsPerFrame - 1) % symbolsPerFrame)] & 1;
             const bool next = flags[static_cast<std::size_t>((s + 1) % symbolsPerFrame)] & 1;
-            for (int i = 0; i < symbolLength; ++i, ++pos) {
-                int& word = words[pos % length];
-                if (flag == 3) word |= 12;  // RF ALC and RF blanking
-                if (flag == 1 || (previous && i <= markerExtension)) word |= 8;
-                if (next && symbolLength - 1 - i <= markerExtension) word |= 8;
-            }
+            if (flag == 3) mark(0, symbolLength, 12);  // RF ALC and RF blanking
+            // RF blanking over the symbol, or over the extension next to a blanked neighbour.
+            if (flag == 1)
+                mark(0, symbolLength, 8);
+            else if (previous && markerExtension >= 0)
+                mark(0, std::min(symbolLength, markerExtension + 1), 8);
+            if (next) mark(std::max(0, symbolLength - 1 - markerExtension), symbolLength, 8);
+            pos += static_cast<std::size_t>(symbolLength);
             if (cancelRequested.load(std::memory_order_relaxed)) return;
         }
     }
@@ -447,8 +459,11 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     if (!hasValidChannel) return;
     for (auto& row : symbolMarks) std::fill(row.begin(), row.end(), 0);
     if (takeCancel()) return;
-    for (auto& row : grid) std::fill(row.begin(), row.end(), std::complex<double>{});
-    for (auto& row : occupancy) std::fill(row.begin(), row.end(), 0);
+    if (!storesClear) {
+        for (auto& row : grid) std::fill(row.begin(), row.end(), std::complex<double>{});
+        for (auto& row : occupancy) std::fill(row.begin(), row.end(), 0);
+    }
+    storesClear = false;
     MarkUnavailable();
     if (takeCancel()) return;
 

@@ -126,6 +126,7 @@ private:
     int highestSubcarrier = 0;
     bool transformPrecoded = false;
     std::vector<std::vector<int>> symbolMarks;  // per antenna, one word per symbol of the frame
+    bool storesClear = false;                   // grid and occupancy hold zeros only
 };
 
 }  // namespace Orvalis_NR
