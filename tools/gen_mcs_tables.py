@@ -14,6 +14,7 @@ for l_d 1 to 3.
 Usage: tools/gen_mcs_tables.py [--check]   (--check: fail when the committed header differs)
 """
 
+from gen_pdsch_tables import block, positions
 from table_generation import TABLES, emit, load
 
 MCS = [
@@ -44,27 +45,6 @@ def mcs_rows(doc):
         else:
             out.append((int(r["Qm"]), 0.0 if reserved else r["R_x1024"], 0.0))
     return out
-
-
-def positions(doc):
-    """15 durations x 8 columns of {defined, additional positions...} with -1 padding."""
-    table = [[[0, -1, -1, -1] for _ in range(8)] for _ in range(15)]
-    for row in doc["rows"]:
-        durations = [1, 2, 3] if row[0] == "<4" else [int(row[0])]
-        for c, cell in enumerate(row[1:]):
-            if cell is None:
-                continue
-            if cell[0] != "l0" or len(cell) > 4:
-                raise SystemExit(f"{doc['table']}: unexpected cell {cell}")
-            extra = [int(v) for v in cell[1:]]
-            for d in durations:
-                table[d][c] = [1] + extra + [-1] * (3 - len(extra))
-    return table
-
-
-def position_block(rows):
-    return "\n".join("    {{" + ", ".join("{" + ", ".join(str(v) for v in cell) + "}" for cell in r) + "}},"
-                     for r in rows)
 
 
 def main():
@@ -102,12 +82,12 @@ using PuschDmrsPositionTable = std::array<std::array<std::array<int, 4>, 8>, 15>
 
 /// TS 38.211 Table 6.4.1.1.3-3 (single-symbol DM-RS).
 inline constexpr PuschDmrsPositionTable kPuschDmrsPositionsSingle = {{{{
-{position_block(positions(load(PUSCH_SINGLE)))}
+{block(positions(load(PUSCH_SINGLE)))}
 }}}};
 
 /// TS 38.211 Table 6.4.1.1.3-4 (double-symbol DM-RS).
 inline constexpr PuschDmrsPositionTable kPuschDmrsPositionsDouble = {{{{
-{position_block(positions(load(PUSCH_DOUBLE)))}
+{block(positions(load(PUSCH_DOUBLE)))}
 }}}};
 
 }}  // namespace Orvalis_NR::tables

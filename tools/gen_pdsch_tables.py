@@ -20,20 +20,19 @@ PTRS = "ts38211_table_7_4_1_2_2_1_ptrs_kref_dl.json"
 
 def positions(doc):
     """15 durations x 8 columns (type A pos0..3, type B pos0..3) of 4 ints:
-    [defined, add1, add2, add3]; 'l0' is always first, -1 pads."""
+    [defined, add1, add2, add3]; 'l0' is always first, -1 pads. A row "<4" (the PUSCH tables
+    have one) holds for durations 1 to 3."""
     table = [[[0, -1, -1, -1] for _ in range(8)] for _ in range(15)]
     for row in doc["rows"]:
-        key = row[0]
-        if key == "<4":
-            continue
-        d = int(key)
+        durations = [1, 2, 3] if row[0] == "<4" else [int(row[0])]
         for c, cell in enumerate(row[1:]):
             if cell is None:
                 continue
             if cell[0] != "l0" or len(cell) > 4:
                 raise SystemExit(f"{doc['table']}: unexpected cell {cell}")
             extra = [int(v) for v in cell[1:]]
-            table[d][c] = [1] + extra + [-1] * (3 - len(extra))
+            for d in durations:
+                table[d][c] = [1] + extra + [-1] * (3 - len(extra))
     return table
 
 

@@ -94,6 +94,26 @@ int dmrsPerSymbol(DMRSConfigurationType type, int cdmGroupsWithoutData) {
     return (type == DMRSConfigurationType::Type1 ? 6 : 4) * cdmGroupsWithoutData;
 }
 
+/// The fields both links name alike. False when allocation type 0 has no bandwidth part.
+template <typename Channel, typename Bwp>
+bool readCommon(const Channel& channel, const Bwp* bwp, Allocation& a) {
+    a.mcs = channel.MCS->getValue();
+    const bool type0 = channel.RAType->getValue() == RAType::RAType0;
+    if (type0 && !bwp) return false;
+    a.resourceBlocks = allocatedResourceBlocks(type0, channel.RBNumber->getValue(), channel.RBGSize->getValue(),
+                                               channel.RBGBitmap->getValue(), bwp ? bwp->RBOffset->getValue() : 0,
+                                               bwp ? bwp->RBNumber->getValue() : 0);
+    a.firstSymbol = channel.FirstSymbol->getValue();
+    a.lastSymbol = channel.LastSymbol->getValue();
+    a.doubleSymbolDmrs = channel.DMRSDuration->getValue() == DMRSDuration::DoubleSymbol;
+    a.additionalPositions = channel.DMRSaddpos->getValue();
+    a.dmrsPerSymbol = dmrsPerSymbol(channel.DMRSConfigurationType->getValue(), channel.NumberOfDMRSCDMGroup->getValue());
+    a.overhead = channel.XOverhead->getValue();
+    return true;
+}
+
+constexpr const char* kNoBwpForType0 = "allocation type 0 needs the bandwidth part BWPIndex names";
+
 }  // namespace
 
 int allocatedResourceBlocks(bool type0, int rbNumber, int rbgSize, const std::string& bitmap, int bwpStart, int bwpSize) {
@@ -115,19 +135,8 @@ SharedChannelSize downlinkSharedChannelSize(const NRDLSCH& channel, const NRDLBW
     static constexpr McsTable kTables[] = {McsTable::Table51311, McsTable::Table51312, McsTable::Table51313};
     const int table = static_cast<int>(channel.MCSTable->getValue());
     a.table = table >= 0 && table < 3 ? kTables[table] : McsTable::Table51311;
-    a.mcs = channel.MCS->getValue();
-    const bool type0 = channel.RAType->getValue() == RAType::RAType0;
-    if (type0 && !bwp) return {false, "allocation type 0 needs the bandwidth part BWPIndex names"};
-    a.resourceBlocks = allocatedResourceBlocks(type0, channel.RBNumber->getValue(), channel.RBGSize->getValue(),
-                                               channel.RBGBitmap->getValue(), bwp ? bwp->RBOffset->getValue() : 0,
-                                               bwp ? bwp->RBNumber->getValue() : 0);
-    a.firstSymbol = channel.FirstSymbol->getValue();
-    a.lastSymbol = channel.LastSymbol->getValue();
+    if (!readCommon(channel, bwp, a)) return {false, kNoBwpForType0};
     a.mappingTypeB = channel.PDSCHMappingType->getValue() == PDSCHMappingType::B;
-    a.doubleSymbolDmrs = channel.DMRSDuration->getValue() == DMRSDuration::DoubleSymbol;
-    a.additionalPositions = channel.DMRSaddpos->getValue();
-    a.dmrsPerSymbol = dmrsPerSymbol(channel.DMRSConfigurationType->getValue(), channel.NumberOfDMRSCDMGroup->getValue());
-    a.overhead = channel.XOverhead->getValue();
     const int layers = channel.NumberOfLayers->getValue();
     a.layers = channel.NumberOfCodewords->getValue() == 2 ? layers / 2 : layers;
     a.scaling = channel.TBScalingFactor->getValue();
@@ -142,23 +151,11 @@ SharedChannelSize uplinkSharedChannelSize(const NRULSCH& channel, const NRULBWP*
                                            McsTable::Table51313, McsTable::Table61412};
     const int table = static_cast<int>(channel.MCSTable->getValue());
     a.table = table >= 0 && table < 5 ? kTables[table] : McsTable::Table51311;
-    a.mcs = channel.MCS->getValue();
+    if (!readCommon(channel, bwp, a)) return {false, kNoBwpForType0};
     a.pi2Bpsk = pi2Bpsk;
-    const bool type0 = channel.RAType->getValue() == RAType::RAType0;
-    if (type0 && !bwp) return {false, "allocation type 0 needs the bandwidth part BWPIndex names"};
-    a.resourceBlocks = allocatedResourceBlocks(type0, channel.RBNumber->getValue(), channel.RBGSize->getValue(),
-                                               channel.RBGBitmap->getValue(), bwp ? bwp->RBOffset->getValue() : 0,
-                                               bwp ? bwp->RBNumber->getValue() : 0);
-    a.firstSymbol = channel.FirstSymbol->getValue();
-    a.lastSymbol = channel.LastSymbol->getValue();
     a.mappingTypeB = channel.PUSCHMappingType->getValue() == PUSCHMappingType::B;
-    a.doubleSymbolDmrs = channel.DMRSDuration->getValue() == DMRSDuration::DoubleSymbol;
-    a.additionalPositions = channel.DMRSaddpos->getValue();
     // With transform precoding a DM-RS symbol carries no data at all (TS 38.211 clause 6.4.1.1.3).
-    a.dmrsPerSymbol = channel.TransformPrecoding->getValue()
-                          ? 12
-                          : dmrsPerSymbol(channel.DMRSConfigurationType->getValue(), channel.NumberOfDMRSCDMGroup->getValue());
-    a.overhead = channel.XOverhead->getValue();
+    if (channel.TransformPrecoding->getValue()) a.dmrsPerSymbol = 12;
     a.layers = channel.NumberOfLayers->getValue();
     const auto& positions = a.doubleSymbolDmrs ? Orvalis_NR::tables::kPuschDmrsPositionsDouble
                                                : Orvalis_NR::tables::kPuschDmrsPositionsSingle;
