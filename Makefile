@@ -7,7 +7,8 @@ CLI := build/release/apps/nrsynth/nrsynth
 DEMO_WAVE ?= examples/ssb_case_c_30khz.json
 
 help:
-	@echo "make demo            install deps, build, generate the default example waveform"
+	@echo "make demo            install deps, build the library and the CLI, generate the default example"
+	@echo "                     waveform and draw its spectrum and resource grid"
 	@echo "make test            install deps, build (g++, release) and run the test suite"
 	@echo "make test-asan       the same suite under ASan + UBSan (clang); builds the fuzz targets"
 	@echo "make fuzz            run each fuzz target FUZZ_SECONDS (default 600) seconds"
@@ -23,7 +24,10 @@ build: deps
 	@cmake --preset release >/dev/null
 	@cmake --build --preset release -j $(JOBS)
 
-demo: build
+# The demo needs the library and the command-line tool only; `make test` builds the rest.
+demo: deps
+	@cmake --preset release >/dev/null
+	@cmake --build --preset release -j $(JOBS) --target nrsynth-cli
 	@bash scripts/demo.sh $(CLI) $(DEMO_WAVE)
 
 test: build

@@ -6,7 +6,7 @@ packages=(
   build-essential cmake ninja-build pkg-config ccache
   libfftw3-dev nlohmann-json3-dev libmsgsl-dev libcli11-dev
   libgtest-dev libgmock-dev libbenchmark-dev
-  python3 python3-numpy
+  python3 python3-numpy python3-matplotlib
   clang libclang-rt-dev
 )
 

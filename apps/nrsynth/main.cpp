@@ -2,9 +2,13 @@
 #include <CLI/CLI.hpp>
 
 #include <iostream>
+#include <iterator>
+#include <string>
+#include <vector>
 
 #include "commands.h"
 #include "generate.h"
+#include "plot.h"
 #include "version.h"
 
 int main(int argc, char** argv) {
@@ -44,6 +48,23 @@ int main(int argc, char** argv) {
                        "leaves out");
     generate->add_option("--export", generateOptions.exportFolder, "write every channel's stages of frame 0 as text files to DIR/Intermediate Data");
 
+    nrsynth_cli::PlotOptions plotOptions;
+    auto* plot = app.add_subcommand(
+        "plot", "Draw WAVE.bin as a PNG picture (Python 3 with numpy and matplotlib): spectrum, CCDF, power "
+                "over time with the markers, the resource grid coloured by channel, or the constellations");
+    plot->add_option("wave", plotOptions.wave, "sample file written by generate")->required();
+    plot->add_option("--doc", plotOptions.document,
+                     "the waveform document of the file (sample rate, carriers; grid and constellation "
+                     "generate frame 0 of it again)");
+    plot->add_option("--kind", plotOptions.kind, "picture kind")
+        ->required()
+        ->check(CLI::IsMember(std::vector<std::string>(std::begin(nrsynth_cli::plotKinds),
+                                                       std::end(nrsynth_cli::plotKinds))));
+    plot->add_option("-o,--output", plotOptions.output, "PNG picture to write (1200 x 800 pixels)")->required();
+    plot->add_option("--carrier", plotOptions.carrier, "carrier of the grid and constellation pictures")
+        ->capture_default_str();
+    plot->add_option("--labels", plotOptions.labels, "grid: also write the channel of every element to FILE.npz");
+
     CLI11_PARSE(app, argc, argv);
 
     if (*show) {
@@ -56,5 +77,6 @@ int main(int argc, char** argv) {
     }
     if (*validate) return nrsynth_cli::validateDocument(wave);
     if (*generate) return nrsynth_cli::generateWaveform(generateOptions);
+    if (*plot) return nrsynth_cli::plotWaveform(plotOptions, argv[0]);
     return 0;
 }
