@@ -262,6 +262,8 @@ def plot_power(x, path, document, out):
         names = [str((document or {}).get("Marker%d" % (bit + 1), "")) for bit in range(4)]
         for bit in range(4):
             starts, ends = marker_runs(markers, bit)
+            shown = ", ".join(str(start) for start in starts[:20]) + (", ..." if len(starts) > 20 else "")
+            print("Marker%d %s: %s" % (bit + 1, names[bit], "runs from samples " + shown if len(starts) else "never high"))
             base = 3 - bit
             lines.hlines(base, 0, len(x) * scale, color="lightgray", lw=0.5)
             for start, end in zip(starts, ends):
