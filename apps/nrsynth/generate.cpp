@@ -7,6 +7,7 @@
 #include <filesystem>
 #include <fstream>
 #include <iostream>
+#include <limits>
 #include <vector>
 
 #include "commands.h"
@@ -14,39 +15,13 @@
 #include "framework/json_serializer.h"
 #include "models/nr5g_waveform_settings.h"
 #include "nrsynth/nrsynth.h"
+#include "output_files.h"
+#include "sigmf_recording.h"
 #include "validation/document_check.h"
 
 namespace nrsynth_cli {
 
 namespace {
-
-struct SignalSummary {
-    std::uint64_t samples = 0;
-    double rms = 0.0;
-    double peak = 0.0;
-};
-
-/// RMS and peak magnitude of a raw complex-double file, read in blocks.
-SignalSummary summarise(const std::string& path) {
-    SignalSummary summary;
-    std::ifstream in(path, std::ios::binary);
-    std::vector<std::complex<double>> block(1 << 16);
-    double energy = 0.0;
-    double peakPower = 0.0;
-    while (in) {
-        in.read(reinterpret_cast<char*>(block.data()), static_cast<std::streamsize>(block.size() * sizeof(block[0])));
-        const auto count = static_cast<std::size_t>(in.gcount()) / sizeof(block[0]);
-        for (std::size_t i = 0; i < count; ++i) {
-            const double power = std::norm(block[i]);
-            energy += power;
-            peakPower = std::max(peakPower, power);
-        }
-        summary.samples += count;
-    }
-    if (summary.samples > 0) summary.rms = std::sqrt(energy / static_cast<double>(summary.samples));
-    summary.peak = std::sqrt(peakPower);
-    return summary;
-}
 
 /// The log with its CR LF separators as plain lines.
 std::string logText() {
@@ -98,9 +73,60 @@ bool passesChecks(const GenerateOptions& options, const std::string& json) {
     return false;
 }
 
+/// Converts the library's files as asked and says what became of them.
+bool writeRequestedFiles(const OutputRequest& request, const std::vector<AntennaFile>& files,
+                         const Models::Nr5g::NR5GWaveformSettings& settings) {
+    RecordingFacts recording;
+    recording.sampleRate = settings.SampleRateAuto->getValue();
+    recording.radioFrequency = settings.RadioFrequency->getValue();
+    recording.frameLength = static_cast<std::uint64_t>(std::max(0.0, std::trunc(recording.sampleRate))) / 100;
+    recording.carriers = carrierBands(settings);
+    Conversion conversion;
+    try {
+        conversion = convertOutputs(request, files, recording);
+    } catch (const std::exception& e) {
+        std::cerr << "nrsynth generate: " << e.what() << "\n";
+        return false;
+    }
+    if (request.format == SampleFormat::Ci16) {
+        double rms = 0.0;
+        double peak = 0.0;
+        std::uint64_t samples = 0;
+        for (const auto& file : files) {
+            rms = std::max(rms, file.levels.rms());
+            peak = std::max(peak, file.levels.peakComponent);
+            samples += file.levels.samples;
+        }
+        // dBFS of a level of the library's samples; 0 rounds to 0.00, never to -0.00.
+        const auto dbfs = [&](double level) {
+            if (!(level > 0.0)) return -std::numeric_limits<double>::infinity();
+            const double db = 20.0 * std::log10(level * conversion.scale / kCi16FullScale);
+            return std::abs(db) < 0.005 ? 0.0 : db;
+        };
+        std::printf("ci16: samples scaled by %.6g, RMS %.2f dBFS (back-off %.2f dB), largest |I|/|Q| "
+                    "%.2f dBFS, %llu of %llu samples clipped\n",
+                    conversion.scale, dbfs(rms), 0.0 - dbfs(rms), dbfs(peak),
+                    static_cast<unsigned long long>(conversion.clipped), static_cast<unsigned long long>(samples));
+    }
+    for (std::size_t a = 0; a < files.size(); ++a) {
+        const auto& file = conversion.files[a];
+        const std::string meta = file.metaPath.empty() ? "" : " + " + file.metaPath;
+        std::printf("antenna %zu as %s: %s%s, markers %s.mkr\n", a, formatName(request.format), file.samplePath.c_str(),
+                    meta.c_str(), files[a].path.c_str());
+    }
+    return true;
+}
+
 }  // namespace
 
 int generateWaveform(const GenerateOptions& options) {
+    OutputRequest request;
+    try {
+        request = outputRequest(options.format, options.backoffDb, options.sigmf);
+    } catch (const std::invalid_argument& e) {
+        std::cerr << "nrsynth generate: " << e.what() << "\n";
+        return 1;
+    }
     std::string json;
     try {
         if (options.asIs) {
@@ -161,19 +187,31 @@ int generateWaveform(const GenerateOptions& options) {
     Orvalis::Tessaline::JsonSerializer reader;
     const auto settings =
         std::dynamic_pointer_cast<Models::Nr5g::NR5GWaveformSettings>(reader.deserialize(json));
-    if (!settings) return 0;
+    if (!settings) return request.keepsLibraryFiles() ? 0 : 1;
     const double sampleRate = settings->SampleRateAuto->getValue();
     const int antennas = settings->NumberOfAntennas->getValue();
     std::printf("sample rate %.0f Hz\n", sampleRate);
-    for (int a = 0; a < antennas; ++a) {
-        const auto name = Orvalis_NR::AntennaFileName(options.output, a, antennas);
-        const auto summary = summarise(name);
-        const double papr = summary.rms > 0.0 ? 20.0 * std::log10(summary.peak / summary.rms) : 0.0;
-        std::printf("antenna %d: %s (+ .mkr)\n  length %llu samples (%.3f ms), RMS %.6f, peak %.6f, PAPR %.2f dB\n", a,
-                    name.c_str(), static_cast<unsigned long long>(summary.samples),
-                    sampleRate > 0 ? 1000.0 * static_cast<double>(summary.samples) / sampleRate : 0.0, summary.rms,
-                    summary.peak, papr);
+    std::vector<AntennaFile> files;
+    try {
+        for (int a = 0; a < antennas; ++a) {
+            const auto name = Orvalis_NR::AntennaFileName(options.output, a, antennas);
+            files.push_back({name, measureLevels(name), recordingDescription(*settings, options.wave, a, antennas)});
+        }
+    } catch (const std::exception& e) {
+        std::cerr << "nrsynth generate: " << e.what() << "\n";
+        return 1;
     }
+    for (int a = 0; a < antennas; ++a) {
+        const auto& levels = files[static_cast<std::size_t>(a)].levels;
+        const double rms = levels.rms();
+        const double papr = rms > 0.0 ? 20.0 * std::log10(levels.peakMagnitude / rms) : 0.0;
+        std::printf("antenna %d: %s (+ .mkr)\n  length %llu samples (%.3f ms), RMS %.6f, peak %.6f, PAPR %.2f dB\n", a,
+                    files[static_cast<std::size_t>(a)].path.c_str(), static_cast<unsigned long long>(levels.samples),
+                    sampleRate > 0 ? 1000.0 * static_cast<double>(levels.samples) / sampleRate : 0.0, rms,
+                    levels.peakMagnitude, papr);
+    }
+    if (request.keepsLibraryFiles()) return 0;
+    return writeRequestedFiles(request, files, *settings) ? 0 : 1;
     return 0;
 }
 

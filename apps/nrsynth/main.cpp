@@ -47,6 +47,19 @@ int main(int argc, char** argv) {
                        "hand the document to the library as it stands, without working out the host values it "
                        "leaves out");
     generate->add_option("--export", generateOptions.exportFolder, "write every channel's stages of frame 0 as text files to DIR/Intermediate Data");
+    generate->add_option("--format", generateOptions.format,
+                         "sample format: cf64 (the library's complex doubles), cf32 (complex float) or ci16 (complex "
+                         "int16, full scale 32767), interleaved I/Q, little endian; cf32 and ci16 replace the cf64 "
+                         "file of each antenna under the same name, marker files stay as they are")
+        ->type_name("cf64|cf32|ci16")
+        ->capture_default_str();
+    generate->add_option("--backoff-db", generateOptions.backoffDb,
+                         "ci16: put the RMS of the strongest antenna B dB below full scale (samples beyond full scale "
+                         "clip and are counted); default: the largest |I| or |Q| of all antennas at full scale")
+        ->type_name("B");
+    generate->add_flag("--sigmf", generateOptions.sigmf,
+                       "write a SigMF recording per antenna: NAME.sigmf-data (the samples in --format, replacing "
+                       "the sample file) and NAME.sigmf-meta; marker files stay as they are");
 
     nrsynth_cli::PlotOptions plotOptions;
     auto* plot = app.add_subcommand(

@@ -66,6 +66,19 @@ check "generate prints the length" grep -q 'length 76800 samples (20.000 ms)' "$
 check "generate writes 2 frames per antenna" test "$(stat -c %s "$work/out/cw0.bin")" -eq $((76800 * 16))
 check "generate writes the markers" test "$(stat -c %s "$work/out/cw1.bin.mkr")" -eq 76800
 check "a CW carrier has a PAPR of 0 dB" grep -q 'PAPR 0.00 dB' "$work/gen.txt"
+# generate --format / --sigmf: the options reach the conversion; bad values stop before the run
+"$cli" generate "$work/cw.json" -o "$work/out/cw16.bin" --format ci16 --sigmf > "$work/gen.txt"; rc=$?
+check "generate --format ci16 --sigmf exits 0" test $rc -eq 0
+check "ci16 SigMF data holds 4 bytes a sample" test "$(stat -c %s "$work/out/cw161.sigmf-data")" -eq $((76800 * 4))
+check "SigMF metadata names the datatype" grep -q '"core:datatype": "ci16_le"' "$work/out/cw161.sigmf-meta"
+check "the cf64 file is gone, the markers stay" test ! -e "$work/out/cw161.bin" -a -s "$work/out/cw161.bin.mkr"
+check "a CW carrier converts without clipping" grep -q '0 of 153600 samples clipped' "$work/gen.txt"
+"$cli" generate "$work/cw.json" -o "$work/out/cwx.bin" --format cf16 > /dev/null 2> "$work/err.txt"; rc=$?
+check "generate --format cf16 exits 1" test $rc -eq 1
+check "generate names the unknown format" grep -q -- '--format "cf16": unknown sample format' "$work/err.txt"
+"$cli" generate "$work/cw.json" -o "$work/out/cwx.bin" --format ci16 --backoff-db nan > /dev/null 2> "$work/err.txt"; rc=$?
+check "generate --backoff-db nan exits 1" test $rc -eq 1 -a ! -e "$work/out/cwx0.bin"
+check "generate names the bad back-off" grep -q -- '--backoff-db "nan": give a finite number' "$work/err.txt"
 "$cli" generate "$work/cw.json" -o x > "$work/gen.txt" 2>&1; rc=$?
 check "generate with a bad output path exits 1" test $rc -eq 1
 check "generate reports the engine's failure" grep -q 'Init Engine Error!' "$work/gen.txt"
