@@ -5,6 +5,7 @@
 #include "sample_format.h"
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <cmath>
 #include <complex>
@@ -23,13 +24,17 @@ using nrsynth_cli::SampleFormat;
 namespace fs = std::filesystem;
 using Samples = std::vector<std::complex<double>>;
 
+/// A folder of its own per test and process (parameterised names lose their '/'), removed after.
+fs::path scratchPath(const std::string& prefix) {
+    std::string name = ::testing::UnitTest::GetInstance()->current_test_info()->name();
+    for (char& c : name)
+        if (c == '/') c = '_';
+    return fs::temp_directory_path() / (prefix + std::to_string(::getpid()) + "_" + name);
+}
+
 class ScratchFolder {
   public:
-    ScratchFolder()
-        : path_(fs::temp_directory_path() /
-                ("nrsynth_formats_" +
-                 std::to_string(::testing::UnitTest::GetInstance()->random_seed()) + "_" +
-                 ::testing::UnitTest::GetInstance()->current_test_info()->name())) {
+    ScratchFolder() : path_(scratchPath("nrsynth_formats_")) {
         fs::remove_all(path_);
         fs::create_directories(path_);
     }
@@ -37,6 +42,8 @@ class ScratchFolder {
         std::error_code ignored;
         fs::remove_all(path_, ignored);
     }
+    ScratchFolder(const ScratchFolder&) = delete;
+    ScratchFolder& operator=(const ScratchFolder&) = delete;
     std::string file(const std::string& name) const { return (path_ / name).string(); }
 
   private:

@@ -4,6 +4,7 @@
 // end-to-end cases run the tool on small waveforms and read the files back against a cf64 run.
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <cmath>
 #include <complex>
@@ -191,8 +192,8 @@ class GeneratedFiles : public testing::Test {
   protected:
     void SetUp() override {
         folder = fs::temp_directory_path() /
-                 ("nrsynth_sigmf_" +
-                  std::string(testing::UnitTest::GetInstance()->current_test_info()->name()));
+                 ("nrsynth_sigmf_" + std::to_string(::getpid()) + "_" +
+                  testing::UnitTest::GetInstance()->current_test_info()->name());
         fs::remove_all(folder);
         fs::create_directories(folder);
         // An SS burst on two antennas: silent between the blocks, so the peak is far above the
