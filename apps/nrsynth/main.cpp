@@ -36,8 +36,8 @@ int main(int argc, char** argv) {
 
     nrsynth_cli::GenerateOptions generateOptions;
     auto* generate = app.add_subcommand(
-        "generate", "Generate WAVE.json through the C interface: one sample file (complex double) and one "
-                    "marker file (.mkr) per antenna");
+        "generate", "Generate WAVE.json through the C interface: one sample file (complex double, or "
+                    "as --format says) and one marker file (.mkr) per antenna");
     generate->add_option("wave", generateOptions.wave, "waveform document (JSON)")->required();
     generate->add_option("-o,--output", generateOptions.output,
                          "sample file path; several antennas get their number before the extension")

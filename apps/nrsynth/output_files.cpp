@@ -87,6 +87,16 @@ std::string sigmfMetaPath(const std::string& samplePath) {
 
 Conversion convertOutputs(const OutputRequest& request, const std::vector<AntennaFile>& antennas,
                           const RecordingFacts& recording) {
+    // The antenna number goes before the last four characters of the output path, so a path
+    // without a short extension can give two antennas one SigMF name.
+    if (request.sigmf)
+        for (std::size_t a = 0; a < antennas.size(); ++a)
+            for (std::size_t b = 0; b < a; ++b)
+                if (sigmfDataPath(antennas[a].path) == sigmfDataPath(antennas[b].path))
+                    throw std::runtime_error(
+                        "--sigmf: " + antennas[b].path + " and " + antennas[a].path +
+                        " would both become " + sigmfDataPath(antennas[a].path) +
+                        "; give -o a name with a 3-letter extension such as out/wave.bin");
     Conversion conversion;
     if (request.format == SampleFormat::Ci16)
         conversion.scale = ci16Scale(antennas, request.backoffDb);

@@ -321,6 +321,28 @@ TEST(SampleFormats, SigmfMovesTheSamplesBesideUntouchedMarkers) {
     EXPECT_EQ(values[1], samples[0].imag());
 }
 
+TEST(SampleFormats, SigmfRefusesAntennasThatWouldShareOneRecording) {
+    ScratchFolder folder;
+    // -o w.sigmf-data with two antennas: the library writes w.sigmf-0data and w.sigmf-1data.
+    std::vector<nrsynth_cli::AntennaFile> antennas;
+    for (const char* name : {"w.sigmf-0data", "w.sigmf-1data"}) {
+        writeCf64(folder.file(name), randomSamples(10, 1.0));
+        antennas.push_back(
+            {folder.file(name), nrsynth_cli::measureLevels(folder.file(name)), name});
+    }
+    nrsynth_cli::OutputRequest request;
+    request.sigmf = true;
+    try {
+        nrsynth_cli::convertOutputs(request, antennas, {});
+        ADD_FAILURE() << "no error";
+    } catch (const std::runtime_error& e) {
+        EXPECT_NE(std::string(e.what()).find("would both become " + folder.file("w.sigmf-data")),
+                  std::string::npos)
+            << e.what();
+    }
+    EXPECT_TRUE(fs::exists(folder.file("w.sigmf-0data")));  // nothing moved
+}
+
 TEST(SampleFormats, AnUnwritableTargetIsReportedWithItsName) {
     ScratchFolder folder;
     writeCf64(folder.file("a.bin"), randomSamples(10, 1.0));
