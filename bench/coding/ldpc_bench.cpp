@@ -89,7 +89,8 @@ void BM_LdpcRateMatch_BG1_Z384(benchmark::State& state) {
 BENCHMARK(BM_LdpcRateMatch_BG1_Z384)->Arg(2)->Arg(6)->Arg(8);
 
 // The shared channel's form: one BG1 Z 384 block with 200 fillers, rv 0, E 9120 at the given Qm,
-// rate matched straight into symbol indices; beside it the bit form at the same E.
+// rate matched straight into symbol indices from the packed encoder output, as the slot path
+// does; beside it the bit form at the same E.
 void rateMatchE9120(benchmark::State& state, bool symbols) {
     const int qm = static_cast<int>(state.range(0));
     Orvalis_NR::LDPC_Encoder encoder;
@@ -104,7 +105,10 @@ void rateMatchE9120(benchmark::State& state, bool symbols) {
     rm.Initialize(LDPC_BG1, 384, 1, encoder.N, encoder.N, e, 0, qm);
     std::vector<int> f(static_cast<std::size_t>(e));
     Orvalis_NR::LdpcSymbolRateMatch fast;
-    const Orvalis_NR::LdpcCircularBuffer buffer{d.data(), encoder.N, rm.K0, kPrime - 768, encoder.K - 768};
+    std::vector<std::uint64_t> packedIn((encoder.K + 63) / 64), packedD((encoder.N + 63) / 64 + 1);
+    for (int i = 0; i < kPrime; ++i) packedIn[static_cast<std::size_t>(i / 64)] |= std::uint64_t(in[static_cast<std::size_t>(i)] & 1) << (i % 64);
+    encoder.RunPacked(packedIn.data(), packedD.data());
+    const Orvalis_NR::LdpcPackedCircularBuffer buffer{packedD.data(), encoder.N, rm.K0, kPrime - 768, encoder.K - 768};
     std::vector<std::uint16_t> out(static_cast<std::size_t>(e / qm));
     for (auto _ : state) {
         if (symbols) fast.run(buffer, e, qm, out.data());

@@ -71,24 +71,17 @@ void NR5GNumerologyGenerator::GetPdcchDmrs(int item, std::vector<std::complex<do
 
 void NR5GNumerologyGenerator::GetPDSCHBeforeCrc(int item, std::vector<char>& data) {
     data.clear();
-    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords) {
-        const auto a = std::min(cw.TbBits.size(), static_cast<std::size_t>(std::max(cw.TbsBits, 0)));
-        data.insert(data.end(), cw.TbBits.begin(), cw.TbBits.begin() + static_cast<std::ptrdiff_t>(a));
-    }
+    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords) cw.appendTransportBlock(data);
 }
 
 void NR5GNumerologyGenerator::GetPDSCHAfterCrc(int item, std::vector<char>& data) {
     data.clear();
-    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords) {
-        const auto b = std::min(cw.TbWithCrc.size(), static_cast<std::size_t>(std::max(cw.TbWithCrcBits, 0)));
-        data.insert(data.end(), cw.TbWithCrc.begin(), cw.TbWithCrc.begin() + static_cast<std::ptrdiff_t>(b));
-    }
+    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords) cw.appendTransportBlockWithCrc(data);
 }
 
 void NR5GNumerologyGenerator::GetPDSCHAfterLdpc(int item, std::vector<int>& data) {
     data.clear();
-    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords)
-        data.insert(data.end(), cw.EncoderOut.begin(), cw.EncoderOut.end());
+    for (const auto& cw : itemOf(pdschGenerators, item, "PDSCH").CodeWords) cw.appendEncoderOutput(data);
 }
 
 void NR5GNumerologyGenerator::GetPDSCHAfterRateMatching(int item, std::vector<int>& data) {

@@ -92,7 +92,63 @@ void runRegister(int length, std::uint32_t pattern, std::uint32_t preset, int nB
     for (int k = 0; k < length; ++k) output[k] = static_cast<char>((reg >> (31 - k)) & 1u);
 }
 
+// Slicing tables: slice k advances the register over a byte followed by k zero bytes.
+using SliceTables = std::array<Table, 8>;
+
+constexpr std::array<SliceTables, 6> kSlices = [] {
+    std::array<SliceTables, 6> slices{};
+    for (std::size_t p = 0; p < kTables.size(); ++p) {
+        slices[p][0] = kTables[p];
+        for (std::size_t k = 1; k < 8; ++k)
+            for (std::size_t i = 0; i < 256; ++i) {
+                const std::uint32_t prior = slices[p][k - 1][i];
+                slices[p][k][i] = (prior << 8) ^ kTables[p][prior >> 24];
+            }
+    }
+    return slices;
+}();
+
+// Packed words hold the first bit in bit 0; the register wants it in bit 7 of the first byte.
+inline std::uint64_t reverseBitsInBytes(std::uint64_t v) {
+    v = ((v >> 1) & 0x5555555555555555ull) | ((v & 0x5555555555555555ull) << 1);
+    v = ((v >> 2) & 0x3333333333333333ull) | ((v & 0x3333333333333333ull) << 2);
+    return ((v >> 4) & 0x0F0F0F0F0F0F0F0Full) | ((v & 0x0F0F0F0F0F0F0F0Full) << 4);
+}
+
 }  // namespace
+
+std::uint32_t PackedCrc(CRC_LengthEnumList type, const std::uint64_t* words, std::size_t nBits) {
+    const int index = static_cast<int>(type);
+    const std::size_t p = (index >= 0 && index < 6) ? static_cast<std::size_t>(index) : 0;
+    const Polynomial poly = kPolynomials[p];
+    const SliceTables& t = kSlices[p];
+    const std::uint32_t alignedPattern = poly.pattern << (32 - poly.length);
+    std::uint32_t reg = 0;
+    const std::size_t whole = nBits / 64;
+    for (std::size_t w = 0; w < whole; ++w) {
+        // Byte k of the word is byte k of the stream: big-endian order puts the first on top.
+        const std::uint64_t x = __builtin_bswap64(reverseBitsInBytes(words[w]));
+        const std::uint32_t hi = static_cast<std::uint32_t>(x >> 32) ^ reg;
+        const std::uint32_t lo = static_cast<std::uint32_t>(x);
+        reg = t[7][hi >> 24] ^ t[6][(hi >> 16) & 0xFFu] ^ t[5][(hi >> 8) & 0xFFu] ^ t[4][hi & 0xFFu] ^
+              t[3][lo >> 24] ^ t[2][(lo >> 16) & 0xFFu] ^ t[1][(lo >> 8) & 0xFFu] ^ t[0][lo & 0xFFu];
+    }
+    if (nBits % 64 != 0) {
+        const std::uint64_t last = words[whole];
+        const std::size_t rest = nBits % 64;
+        std::size_t b = 0;
+        for (; b + 8 <= rest; b += 8) {
+            const auto byte = static_cast<std::uint32_t>(reverseBitsInBytes(last >> b) & 0xFFu);
+            reg = (reg << 8) ^ t[0][(reg >> 24) ^ byte];
+        }
+        for (; b < rest; ++b) {
+            const bool shiftedOut = (reg & 0x80000000u) != 0;
+            reg <<= 1;
+            if (shiftedOut != (((last >> b) & 1u) != 0)) reg ^= alignedPattern;
+        }
+    }
+    return reg >> (32 - poly.length);
+}
 
 int CrcLength(CRC_LengthEnumList type) {
     return polynomialOf(type).length;

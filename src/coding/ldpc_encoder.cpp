@@ -46,6 +46,12 @@ bool LDPC_Encoder::Run(std::vector<int>& in, std::vector<int>& out) {
     return RunWith(ldpcPreferredKernel(), in, out);
 }
 
+void LDPC_Encoder::RunPacked(const std::uint64_t* in, std::uint64_t* out) {
+    if (Z == 0) throw std::logic_error("LDPC_Encoder::RunPacked before Initialize");
+    const LdpcKernel kernel = ldpcPreferredKernel();
+    Packed.EncodeBits(kernel == LdpcKernel::List ? LdpcKernel::Portable : kernel, in, out);
+}
+
 bool LDPC_Encoder::Run() { return Run(InfoBits, CodedBits); }
 
 bool LDPC_Encoder::RunWith(LdpcKernel kernel, std::vector<int>& in, std::vector<int>& out) {

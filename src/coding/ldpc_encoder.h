@@ -1,6 +1,7 @@
 #pragma once
 // LDPC encoder of TS 38.212 clause 5.3.2 for one code block geometry (base graph, Z).
 
+#include <cstdint>
 #include <vector>
 
 #include "coding/ldpc_packed_encoder.h"
@@ -27,6 +28,11 @@ public:
     /// word without its first 2Z systematic bits, fillers as -2). Fillers in `in` from
     /// position 2Z on are set to 0. False when the sizes differ from K and N.
     bool Run(std::vector<int>& in, std::vector<int>& out);
+
+    /// Encodes packed bits: `in` K bits, fillers cleared to 0 and none among the first 2Z;
+    /// `out` (words for N bits) the d sequence with fillers as 0. The same bits as Run gives
+    /// for 0/1 inputs, fillers aside.
+    void RunPacked(const std::uint64_t* in, std::uint64_t* out);
 
     /// Run over InfoBits and CodedBits.
     bool Run();

@@ -120,7 +120,11 @@ struct Avx2Ops {
 }  // namespace
 
 bool encodePackedAvx2(const PackedPlanView& plan, int* in, int* out) {
-    return runPackedPlan<Avx2Ops>(plan, in, out);
+    return runPackedPlan<Avx2Ops>(plan, IntVectors<Avx2Ops>{in, out});
+}
+
+void encodeBitsAvx2(const PackedPlanView& plan, const std::uint64_t* in, std::uint64_t* out) {
+    runPackedPlan<Avx2Ops>(plan, PackedVectors{in, out});
 }
 
 }  // namespace Orvalis_NR::ldpc_detail

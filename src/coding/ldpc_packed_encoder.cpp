@@ -124,9 +124,8 @@ void LdpcPackedEncoder::Build(const std::vector<std::vector<int>>& base, int kb,
     Acc.assign(static_cast<std::size_t>(6 * PaddedWords), 0);
 }
 
-bool LdpcPackedEncoder::Encode(LdpcKernel kernel, int* in, int* out) {
-    if (!Built()) throw std::logic_error("LdpcPackedEncoder::Encode before Build");
-    const ldpc_detail::PackedPlanView plan{Z,
+ldpc_detail::PackedPlanView LdpcPackedEncoder::view() {
+    return ldpc_detail::PackedPlanView{Z,
                                            Kb,
                                            Rows,
                                            Words,
@@ -143,6 +142,24 @@ bool LdpcPackedEncoder::Encode(LdpcKernel kernel, int* in, int* out) {
                                            Columns.data(),
                                            Packed.data(),
                                            Acc.data()};
+}
+
+void LdpcPackedEncoder::EncodeBits(LdpcKernel kernel, const std::uint64_t* in, std::uint64_t* out) {
+    if (!Built()) throw std::logic_error("LdpcPackedEncoder::EncodeBits before Build");
+    const ldpc_detail::PackedPlanView plan = view();
+#if defined(NRSYNTH_HAVE_AVX2_KERNELS)
+    if (kernel == LdpcKernel::Avx2 && ldpcKernelSupported(LdpcKernel::Avx2)) {
+        ldpc_detail::encodeBitsAvx2(plan, in, out);
+        return;
+    }
+#endif
+    if (kernel == LdpcKernel::Avx2) throw std::invalid_argument("LdpcPackedEncoder: this CPU has no AVX2");
+    ldpc_detail::encodeBitsPortable(plan, in, out);
+}
+
+bool LdpcPackedEncoder::Encode(LdpcKernel kernel, int* in, int* out) {
+    if (!Built()) throw std::logic_error("LdpcPackedEncoder::Encode before Build");
+    const ldpc_detail::PackedPlanView plan = view();
     switch (kernel) {
         case LdpcKernel::Portable:
             return ldpc_detail::encodePackedPortable(plan, in, out);

@@ -7,6 +7,10 @@
 
 namespace Orvalis_NR {
 
+namespace ldpc_detail {
+struct PackedPlanView;
+}
+
 /// How LDPC_Encoder computes a block. All forms give the same output.
 enum class LdpcKernel {
     List,      // the row lists of LdpcEncoderCore::Encode2, the reference
@@ -31,9 +35,15 @@ public:
     /// other than 0, 1, -2, or -2 among the first 2Z); the caller then uses the list form.
     bool Encode(LdpcKernel kernel, int* in, int* out);
 
+    /// Encodes packed bits (see common/packed_bits.h): `in` holds K bits with fillers as 0, `out`
+    /// receives the N bits of the d sequence (input bits 2Z to K, then the parity), words
+    /// enough for N bits. The list form, on request, runs as the portable kernel.
+    void EncodeBits(LdpcKernel kernel, const std::uint64_t* in, std::uint64_t* out);
+
     bool Built() const { return Z > 0; }
 
 private:
+    ldpc_detail::PackedPlanView view();
     int Z = 0;
     int Kb = 0;
     int Rows = 0;

@@ -13,6 +13,8 @@
 #include <cstddef>
 #include <cstring>
 
+#include "common/packed_bits.h"
+
 namespace Orvalis_NR::ldpc_detail {
 
 static_assert(std::endian::native == std::endian::little,
@@ -41,6 +43,8 @@ struct PackedPlanView {
 
 bool encodePackedPortable(const PackedPlanView& plan, int* in, int* out);
 bool encodePackedAvx2(const PackedPlanView& plan, int* in, int* out);
+void encodeBitsPortable(const PackedPlanView& plan, const std::uint64_t* in, std::uint64_t* out);
+void encodeBitsAvx2(const PackedPlanView& plan, const std::uint64_t* in, std::uint64_t* out);
 
 namespace {
 
@@ -102,36 +106,73 @@ inline void fillPeriodic(std::uint64_t* column, int stride, const std::uint64_t*
     }
 }
 
-// The encoding schedule, shared by the kernels; Ops supplies packing, the row sums of
-// rotated columns and unpacking. Returns false, touching nothing, when the input holds a
-// value other than 0, 1 or -2, or a -2 among the first 2Z bits: those inputs take the list
-// form, which defines what they give.
+// Inputs and outputs as int vectors (one value per bit, -2 for a filler). load packs the
+// input and writes the systematic output; it returns false, touching nothing, when the input
+// holds a value other than 0, 1 or -2, or a -2 among the first 2Z bits: those inputs take the
+// list form, which defines what they give.
 template <class Ops>
-bool runPackedPlan(const PackedPlanView& p, int* in, int* out) {
+struct IntVectors {
+    int* in;
+    int* out;
+
+    bool load(const PackedPlanView& p) {
+        const int z = p.z;
+        const int k = p.kb * z;
+        const PackScan scan = Ops::pack(in, k, p.packed);
+        if (scan.bad) return false;
+        if (scan.filler) {
+            for (int i = 0; i < 2 * z; ++i) {
+                if (in[i] == -2) return false;
+            }
+        }
+        // Systematic output, fillers marked; from here on a filler reads as 0 (its packed bit
+        // already is 0, since -2 is even).
+        std::memcpy(out, in + 2 * z, sizeof(int) * static_cast<std::size_t>(k - 2 * z));
+        if (scan.filler) {
+            for (int i = 2 * z; i < k; ++i) {
+                if (in[i] == -2) in[i] = 0;
+            }
+        }
+        return true;
+    }
+    // Parity vector v (z bits) at parity bit `at` of the output.
+    void parity(const PackedPlanView& p, const std::uint64_t* v, int at) {
+        Ops::unpack(v, p.z, out + (p.kb - 2) * p.z + at);
+    }
+};
+
+// Inputs and outputs packed (see packed_bits.h): K input bits with fillers already 0, N output
+// bits (the input from bit 2Z on, then the parity).
+struct PackedVectors {
+    const std::uint64_t* in;
+    std::uint64_t* out;
+
+    bool load(const PackedPlanView& p) {
+        const int k = p.kb * p.z;
+        const int used = (k + 63) / 64;
+        std::memcpy(p.packed, in, sizeof(std::uint64_t) * static_cast<std::size_t>(used));
+        if (k % 64) p.packed[used - 1] &= (std::uint64_t{1} << (k % 64)) - 1;
+        for (int w = used; w <= k / 64 + 1; ++w) p.packed[w] = 0;  // the spare words, as pack leaves them
+        copyBits(out, 0, in, static_cast<std::size_t>(2 * p.z), static_cast<std::size_t>(k - 2 * p.z));
+        return true;
+    }
+    void parity(const PackedPlanView& p, const std::uint64_t* v, int at) {
+        copyBits(out, static_cast<std::size_t>((p.kb - 2) * p.z + at), v, 0, static_cast<std::size_t>(p.z));
+    }
+};
+
+// The encoding schedule, shared by the kernels; Ops supplies the row sums of rotated columns,
+// Io the input and output forms.
+template <class Ops, class Io>
+bool runPackedPlan(const PackedPlanView& p, Io io) {
+    if (!io.load(p)) return false;
     const int z = p.z;
-    const int k = p.kb * z;
-    const PackScan scan = Ops::pack(in, k, p.packed);
-    if (scan.bad) return false;
-    if (scan.filler) {
-        for (int i = 0; i < 2 * z; ++i) {
-            if (in[i] == -2) return false;
-        }
-    }
-    // Systematic output, fillers marked; from here on a filler reads as 0 (its packed bit
-    // already is 0, since -2 is even).
-    std::memcpy(out, in + 2 * z, sizeof(int) * static_cast<std::size_t>(k - 2 * z));
-    if (scan.filler) {
-        for (int i = 2 * z; i < k; ++i) {
-            if (in[i] == -2) in[i] = 0;
-        }
-    }
 
     const auto column = [&](int c) { return p.columns + static_cast<std::size_t>(c) * p.stride; };
     const auto vec = [&](int i) { return p.acc + static_cast<std::size_t>(i) * p.paddedWords; };
     std::uint64_t* work = vec(4);
     std::uint64_t* parity = vec(5);
     std::uint64_t* scratch = column(p.kb + 4);
-    int* parityOut = out + (p.kb - 2) * z;
 
     for (int c = 0; c < p.kb; ++c) {
         extractBits(p.packed, c * z, z, work, p.paddedWords);
@@ -152,7 +193,7 @@ bool runPackedPlan(const PackedPlanView& p, int* in, int* out) {
         std::memcpy(parity, work, sizeof(std::uint64_t) * p.paddedWords);
     }
     fillPeriodic(column(p.kb), p.stride, parity, z);
-    Ops::unpack(parity, z, parityOut);
+    io.parity(p, parity, 0);
 
     // p1..p3, each from a head row whose other parity columns are known by then.
     for (int t = 0; t < 3; ++t) {
@@ -169,13 +210,13 @@ bool runPackedPlan(const PackedPlanView& p, int* in, int* out) {
             std::memcpy(parity, work, sizeof(std::uint64_t) * p.paddedWords);
         }
         fillPeriodic(column(j), p.stride, parity, z);
-        Ops::unpack(parity, z, parityOut + (j - p.kb) * z);
+        io.parity(p, parity, (j - p.kb) * z);
     }
 
     // Extension rows: one parity block each, from information and head parity columns.
     for (int b = 4; b < p.rows; ++b) {
         Ops::rowXor(work, p, p.rowBegin[b], p.rowBegin[b + 1]);
-        Ops::unpack(work, z, parityOut + b * z);
+        io.parity(p, work, b * z);
     }
     return true;
 }

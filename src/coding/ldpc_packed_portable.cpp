@@ -92,7 +92,11 @@ struct PortableOps {
 }  // namespace
 
 bool encodePackedPortable(const PackedPlanView& plan, int* in, int* out) {
-    return runPackedPlan<PortableOps>(plan, in, out);
+    return runPackedPlan<PortableOps>(plan, IntVectors<PortableOps>{in, out});
+}
+
+void encodeBitsPortable(const PackedPlanView& plan, const std::uint64_t* in, std::uint64_t* out) {
+    runPackedPlan<PortableOps>(plan, PackedVectors{in, out});
 }
 
 }  // namespace Orvalis_NR::ldpc_detail

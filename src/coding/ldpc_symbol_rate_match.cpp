@@ -9,65 +9,66 @@
 #endif
 
 #include "common/failure.h"
+#include "common/packed_bits.h"
 
 namespace Orvalis_NR {
 namespace {
 
-constexpr int kPadding = 8;  // one whole 64-bit load past the last selected bit
+constexpr std::size_t kSpareWords = 2;  // one unaligned 64-bit read past the last selected bit
 
-std::uint64_t load64(const std::uint8_t* p) {
+inline std::uint64_t load64(const unsigned char* p) {
     std::uint64_t v;
     std::memcpy(&v, p, sizeof v);
     return v;
 }
 
-// Eight symbols at a time: row i of the interleaver (bits e(i R + j), j = 0..7) goes to bit i
-// of eight byte lanes. Each lane holds 0 or 1 before the shift, so lanes never carry.
+// Bit `at` of the packed selection and the 16 after it (fewer near the end: spare words).
+inline unsigned bits16(const unsigned char* e, std::size_t at) {
+    return static_cast<unsigned>(load64(e + at / 8) >> (at % 8)) & 0xFFFFu;
+}
+
+// One symbol: bit i of symbol j is e(i R + j), R = rows.
+inline std::uint16_t gatherSymbol(const unsigned char* e, int rows, int qm, int j) {
+    unsigned index = 0;
+    for (int i = 0; i < qm; ++i) {
+        const std::size_t at = static_cast<std::size_t>(i) * static_cast<std::size_t>(rows) + static_cast<std::size_t>(j);
+        index |= ((static_cast<unsigned>(e[at / 8]) >> (at % 8)) & 1u) << i;
+    }
+    return static_cast<std::uint16_t>(index);
+}
+
+// Sixteen symbols at a time for Qm up to 8: 16 bits of interleaver row i are spread over
+// byte lanes (lane 2m bit m of the low byte, lane 2m + 1 bit m of the high byte), reduced to
+// 0 or 1 and shifted to bit i. The even lanes then hold symbols j..j+7, the odd ones j+8..15.
 template <int Q>
-void interleaveToSymbols(const std::uint8_t* e, int rows, std::uint16_t* symbols) {
+void interleave(const unsigned char* e, int rows, std::uint16_t* symbols) {
     int j = 0;
-    for (; j + 8 <= rows; j += 8) {
-        std::uint64_t lanes = 0;
-        for (int i = 0; i < Q; ++i) lanes |= load64(e + static_cast<std::size_t>(i) * rows + j) << i;
-        for (int k = 0; k < 8; ++k) symbols[j + k] = static_cast<std::uint16_t>((lanes >> (8 * k)) & 0xFFu);
-    }
-    for (; j < rows; ++j) {
-        unsigned index = 0;
-        for (int i = 0; i < Q; ++i) index |= static_cast<unsigned>(e[static_cast<std::size_t>(i) * rows + j]) << i;
-        symbols[j] = static_cast<std::uint16_t>(index);
-    }
-}
-
-// Any Qm up to 10, a symbol at a time.
-void interleaveToSymbols(const std::uint8_t* e, int rows, int qm, std::uint16_t* symbols) {
-    for (int j = 0; j < rows; ++j) {
-        unsigned index = 0;
-        for (int i = 0; i < qm; ++i) index |= static_cast<unsigned>(e[static_cast<std::size_t>(i) * rows + j]) << i;
-        symbols[j] = static_cast<std::uint16_t>(index);
-    }
-}
-
-// Encoder outputs (0 or 1 as int) to one byte each; SSE2 packs sixteen at a time.
-void narrowBits(const int* from, int length, std::uint8_t* to) {
-    int i = 0;
 #if defined(__SSE2__)
-    for (; i + 16 <= length; i += 16) {
-        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(from + i));
-        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(from + i + 4));
-        const __m128i c = _mm_loadu_si128(reinterpret_cast<const __m128i*>(from + i + 8));
-        const __m128i d = _mm_loadu_si128(reinterpret_cast<const __m128i*>(from + i + 12));
-        const __m128i one = _mm_set1_epi32(1);
-        const __m128i low = _mm_packs_epi32(_mm_and_si128(a, one), _mm_and_si128(b, one));
-        const __m128i high = _mm_packs_epi32(_mm_and_si128(c, one), _mm_and_si128(d, one));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(to + i), _mm_packus_epi16(low, high));
+    const __m128i laneBit = _mm_setr_epi8(1, 1, 2, 2, 4, 4, 8, 8, 16, 16, 32, 32, 64, 64, -128, -128);
+    const __m128i one = _mm_set1_epi8(1);
+    const __m128i lowByte = _mm_set1_epi16(0x00FF);
+    for (; j + 16 <= rows; j += 16) {
+        __m128i acc = _mm_setzero_si128();
+        for (int i = 0; i < Q; ++i) {
+            const std::size_t at = static_cast<std::size_t>(i) * static_cast<std::size_t>(rows) + static_cast<std::size_t>(j);
+            const __m128i row = _mm_set1_epi16(static_cast<short>(bits16(e, at)));
+            const __m128i bit = _mm_min_epu8(_mm_and_si128(row, laneBit), one);
+            acc = _mm_or_si128(acc, _mm_slli_epi16(bit, i));
+        }
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(symbols + j), _mm_and_si128(acc, lowByte));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(symbols + j + 8), _mm_srli_epi16(acc, 8));
     }
 #endif
-    for (; i < length; ++i) to[i] = static_cast<std::uint8_t>(from[i] & 1);
+    for (; j < rows; ++j) symbols[j] = gatherSymbol(e, rows, Q, j);
+}
+
+void interleaveAnyOrder(const unsigned char* e, int rows, int qm, std::uint16_t* symbols) {
+    for (int j = 0; j < rows; ++j) symbols[j] = gatherSymbol(e, rows, qm, j);
 }
 
 }  // namespace
 
-void LdpcSymbolRateMatch::select(const LdpcCircularBuffer& buffer, int e) {
+void LdpcSymbolRateMatch::select(const LdpcPackedCircularBuffer& buffer, int e) {
     const int ncb = buffer.Ncb;
     // The filler run as it lies inside the circular buffer.
     const int fillerBegin = std::clamp(buffer.FillerBegin, 0, ncb);
@@ -77,7 +78,7 @@ void LdpcSymbolRateMatch::select(const LdpcCircularBuffer& buffer, int e) {
                  "Ncb " + std::to_string(ncb));
     int pos = buffer.K0 % ncb;
     if (pos < 0) pos += ncb;
-    std::uint8_t* out = selected_.data();
+    std::uint64_t* out = selected_.data();
     int gathered = 0;
     while (gathered < e) {
         if (pos >= fillerBegin && pos < fillerEnd) pos = fillerEnd;
@@ -85,10 +86,32 @@ void LdpcSymbolRateMatch::select(const LdpcCircularBuffer& buffer, int e) {
         if (pos >= fillerBegin && pos < fillerEnd) continue;  // a run at the buffer start
         const int end = pos < fillerBegin ? fillerBegin : ncb;
         const int length = std::min(end - pos, e - gathered);
-        narrowBits(buffer.D + pos, length, out + gathered);
+        copyBits(out, static_cast<std::size_t>(gathered), buffer.Bits, static_cast<std::size_t>(pos),
+                 static_cast<std::size_t>(length));
         gathered += length;
         pos += length;
         if (pos == ncb) pos = 0;
+    }
+}
+
+void LdpcSymbolRateMatch::run(const LdpcPackedCircularBuffer& buffer, int e, int qm, std::uint16_t* symbols) {
+    if (e <= 0) return;
+    if (buffer.Bits == nullptr || buffer.Ncb <= 0 || symbols == nullptr)
+        failWith("LDPC rate matching needs a circular buffer.", "Ncb " + std::to_string(buffer.Ncb));
+    if (qm < 1 || qm > 10) failWith("The modulation order must be 1 to 10.", "Qm " + std::to_string(qm));
+    const std::size_t need = packedWords(static_cast<std::size_t>(e)) + kSpareWords;
+    if (selected_.size() < need) selected_.resize(need);
+    select(buffer, e);
+
+    const auto* bytes = reinterpret_cast<const unsigned char*>(selected_.data());
+    const int rows = e / qm;
+    switch (qm) {
+        case 1: interleave<1>(bytes, rows, symbols); break;
+        case 2: interleave<2>(bytes, rows, symbols); break;
+        case 4: interleave<4>(bytes, rows, symbols); break;
+        case 6: interleave<6>(bytes, rows, symbols); break;
+        case 8: interleave<8>(bytes, rows, symbols); break;
+        default: interleaveAnyOrder(bytes, rows, qm, symbols); break;
     }
 }
 
@@ -96,20 +119,14 @@ void LdpcSymbolRateMatch::run(const LdpcCircularBuffer& buffer, int e, int qm, s
     if (e <= 0) return;
     if (buffer.D == nullptr || buffer.Ncb <= 0 || symbols == nullptr)
         failWith("LDPC rate matching needs a circular buffer.", "Ncb " + std::to_string(buffer.Ncb));
-    if (qm < 1 || qm > 10) failWith("The modulation order must be 1 to 10.", "Qm " + std::to_string(qm));
-    const std::size_t need = static_cast<std::size_t>(e) + kPadding;
-    if (selected_.size() < need) selected_.resize(need);
-    select(buffer, e);
-
-    const int rows = e / qm;
-    switch (qm) {
-        case 1: interleaveToSymbols<1>(selected_.data(), rows, symbols); break;
-        case 2: interleaveToSymbols<2>(selected_.data(), rows, symbols); break;
-        case 4: interleaveToSymbols<4>(selected_.data(), rows, symbols); break;
-        case 6: interleaveToSymbols<6>(selected_.data(), rows, symbols); break;
-        case 8: interleaveToSymbols<8>(selected_.data(), rows, symbols); break;
-        default: interleaveToSymbols(selected_.data(), rows, qm, symbols); break;
-    }
+    // Bit 0 of each output is what goes on (a filler's -2 reads 0 and is skipped anyway).
+    const std::size_t n = static_cast<std::size_t>(buffer.Ncb);
+    if (unpacked_.size() < packedWords(n)) unpacked_.resize(packedWords(n));
+    std::fill(unpacked_.begin(), unpacked_.begin() + static_cast<std::ptrdiff_t>(packedWords(n)), 0);
+    for (std::size_t i = 0; i < n; ++i)
+        unpacked_[i / 64] |= static_cast<std::uint64_t>(buffer.D[i] & 1) << (i % 64);
+    run(LdpcPackedCircularBuffer{unpacked_.data(), buffer.Ncb, buffer.K0, buffer.FillerBegin, buffer.FillerEnd}, e, qm,
+        symbols);
 }
 
 }  // namespace Orvalis_NR

@@ -49,6 +49,8 @@ struct SchCodeWord {
     std::vector<int> CodedBits;                ///< G payload bits when channel coding is off
     std::vector<std::uint16_t> CodedSymbols;   ///< G / Qm symbols of coded bits, first bit in bit 0
     std::vector<std::uint64_t> PnWords;        ///< G scrambling bits, packed, first in bit 0
+    long long PnBits = 0;                      ///< bits of PnWords that hold the sequence of PnCInit
+    int PnCInit = -1;
     std::vector<std::vector<complex>> Layers;  ///< one vector of R symbols per layer
     std::vector<complex> Constellation;        ///< indexed by the bits, first bit most significant
     std::vector<complex> SymbolTable;          ///< the same points indexed first bit least significant
@@ -69,6 +71,19 @@ struct SchCodeWord {
     int BaseGraph = 1;  ///< 1 or 2
     int Modulation = 0;
     std::vector<int> EncoderIn;    ///< K encoder inputs, -2 for a filler
+    // The packed chain (common/packed_bits.h); the vectors above serve payloads that hold
+    // other values than 0 and 1.
+    std::vector<std::uint64_t> TbWords;  ///< B bits: the transport block and its CRC
+    std::vector<std::uint64_t> CbWords;  ///< K bits of the code block being encoded
+    std::vector<std::uint64_t> DWords;   ///< N encoder outputs of the last encoded block
+    int LastFillerBegin = 0;             ///< its fillers in DWords: [LastFillerBegin, K - 2Z)
+    bool PackedSlot = false;             ///< the last slot went through the packed chain
+
+    /// The slot's bits for export, appended: the transport block (A), with its CRC (B), and the
+    /// last encoded block's N encoder outputs with fillers as -2.
+    void appendTransportBlock(std::vector<char>& out) const;
+    void appendTransportBlockWithCrc(std::vector<char>& out) const;
+    void appendEncoderOutput(std::vector<int>& out) const;
 };
 
 class PDSCH_Generator {
@@ -206,7 +221,9 @@ class PDSCH_Generator {
     bool coresetHit(int prb) const;
     bool ssbHit(int prb, int symbolInFrame, int firstOfSlot, int lastOfSlot) const;
     void generateDmrs(int subframe, int slot);
-    void encodeCodeWord(SchCodeWord& cw);
+    void encodeCodeWordPacked(SchCodeWord& cw);
+    void encodeCodeWordBits(SchCodeWord& cw);
+    void initRateMatch(SchCodeWord& cw, int e);
     void modulateAndMapLayers(SchCodeWord& cw, bool scrambled);
     int portGroupOffset(int port) const;
     bool readSlot(int entry, int frame, SlotPlace& place) const;
@@ -241,7 +258,14 @@ class PDSCH_Generator {
         std::size_t read = 0;
         complex* values = nullptr;  ///< the store row's values and occupancy in this frame
         int* occupancy = nullptr;
+        /// Per subcarrier of an RB on the current DM-RS symbol: the DM-RS value's place in the
+        /// RB (0 up) or one of the kPattern actions.
+        std::array<signed char, 12> pattern{};
     };
+    static constexpr signed char kPatternNothing = -1;
+    static constexpr signed char kPatternData = -2;
+    static constexpr signed char kPatternReserved = -3;
+    void setRowPatterns(bool withData);
     /// One resource element of the walk.
     struct ElementPlace {
         std::size_t at = 0;  ///< index in a store row
@@ -255,6 +279,7 @@ class PDSCH_Generator {
     void walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, int frame, OccupancyGrid& symbolFlags,
                         bool firstChannel, bool precoded);
     void mapElement(const ElementPlace& e, bool precoded);
+    bool mapElementRow(const ElementPlace& e, std::size_t r, bool precoded);
     bool dmrsPortValue(const ElementPlace& e, std::size_t r, bool precoded, complex& value) const;
     bool dataPortValue(std::size_t r, bool precoded, complex& value);
 

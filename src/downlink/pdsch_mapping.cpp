@@ -102,17 +102,22 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
     layers_.assign(Ports.size(), nullptr);
     for (std::size_t x = 0; x < Ports.size(); ++x) layers_[x] = portLayer(static_cast<int>(x));
 
-    // One RB of a data-only symbol without precoding: the rules of mapElement, with a whole-RB
-    // copy where no earlier channel holds any of its elements.
-    auto mapPlainDataRb = [this](std::size_t line, int prb) {
-        std::array<std::size_t, 12> at{};
+    // Store index of each element of an RB, and whether they lie side by side.
+    auto rbElements = [this](std::size_t line, int prb, std::array<std::size_t, 12>& at) {
         for (int j = 0; j < 12; ++j) {
             int column = 12 * prb + j + PointAOffset;
             if (column < 0) column += GridWidth;
             else if (column >= GridWidth) column -= GridWidth;
             at[static_cast<std::size_t>(j)] = line + static_cast<std::size_t>(column);
         }
-        const bool contiguous = at[11] == at[0] + 11;
+        return at[11] == at[0] + 11;
+    };
+
+    // One RB of a data-only symbol without precoding: the rules of mapElement, with a whole-RB
+    // copy where no earlier channel holds any of its elements.
+    auto mapPlainDataRb = [this, &rbElements](std::size_t line, int prb) {
+        std::array<std::size_t, 12> at{};
+        const bool contiguous = rbElements(line, prb, at);
         for (auto& row : rows_) {
             const auto* layer = layers_[static_cast<std::size_t>(row.position)];
             const std::size_t available = layer ? layer->size() : 0;
@@ -138,6 +143,53 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
                     o = kData;
                 } else if (o != kDmrs && o != kPtrs && o != kCdmReserved && !isSsb(o)) {
                     o = kData;
+                }
+            }
+        }
+    };
+
+    // One RB of a DM-RS symbol without precoding and without PT-RS: where no earlier channel
+    // holds any of a row's elements, the row's pattern for the symbol (rowPattern) places DM-RS,
+    // CDM-reserved and data elements; otherwise mapElement's rules go element by element.
+    auto mapDmrsRb = [this, &rbElements](std::size_t line, ElementPlace& e) {
+        std::array<std::size_t, 12> at{};
+        const bool contiguous = rbElements(line, e.prb, at);
+        const int perRb = DmrsConfigType == 1 ? 6 : 4;
+        const long long base = static_cast<long long>(e.prb - LowestPrb) * perRb;
+        for (std::size_t r = 0; r < rows_.size(); ++r) {
+            MappedRow& row = rows_[r];
+            int* o = row.occupancy + at[0];
+            int taken = 0;
+            if (contiguous)
+                for (int j = 0; j < 12; ++j) taken |= o[j];
+            if (!contiguous || taken != 0) {
+                for (int j = 0; j < 12; ++j) {
+                    e.at = at[static_cast<std::size_t>(j)];
+                    e.re = j;
+                    mapElementRow(e, r, false);
+                }
+                continue;
+            }
+            const std::vector<complex>* sequence = nullptr;
+            if (e.dmrsIndex >= 0) {
+                const auto& symbol = DmrsValues[static_cast<std::size_t>(e.dmrsIndex)];
+                if (static_cast<std::size_t>(row.position) < symbol.size()) sequence = &symbol[static_cast<std::size_t>(row.position)];
+            }
+            const auto* layer = layers_[static_cast<std::size_t>(row.position)];
+            const std::size_t available = layer ? layer->size() : 0;
+            complex* v = row.values + at[0];
+            for (int j = 0; j < 12; ++j) {
+                const int action = row.pattern[static_cast<std::size_t>(j)];
+                if (action >= 0) {
+                    const long long k = base + action;
+                    if (sequence && k >= 0 && k < static_cast<long long>(sequence->size()))
+                        v[j] = (*sequence)[static_cast<std::size_t>(k)] * DmrsAmplitude;
+                    o[j] = kDmrs;
+                } else if (action == kPatternData) {
+                    if (row.read < available) v[j] = (*layer)[row.read++] * DataAmplitude;
+                    o[j] = kData;
+                } else if (action == kPatternReserved) {
+                    o[j] = kCdmReserved;
                 }
             }
         }
@@ -180,6 +232,7 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
             const std::size_t line = static_cast<std::size_t>(f + s) * width;
             // Data alone on an unprecoded symbol: each row takes its layer RB by RB.
             const bool plainData = !precoded && cls == 2;
+            if (!precoded && e.isDmrs) setRowPatterns(e.isData);
             int rbCounter = 0;
             for (int n = AllocRbStart; n < AllocRbStart + AllocRbCount; ++n) {
                 if (!RbMask[static_cast<std::size_t>(n)]) continue;
@@ -195,6 +248,16 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
                 }
                 e.prb = p;
                 e.ptrsRb = isPtrs && (rbIndex - PtrsRbOffset) % KPtrs == 0;
+                if (!precoded && !e.ptrsRb) {
+                    if (e.isDmrs) {
+                        mapDmrsRb(line, e);
+                        continue;
+                    }
+                    if (e.isData) {  // a PT-RS symbol's RB without PT-RS
+                        mapPlainDataRb(line, p);
+                        continue;
+                    }
+                }
                 for (int j = 0; j < 12; ++j) {
                     int column = 12 * p + j + PointAOffset;
                     if (column < 0) column += GridWidth;
@@ -209,62 +272,88 @@ void PDSCH_Generator::walkAllocation(SlotGrid& grid, OccupancyGrid& occupancy, i
     CancelRequested.store(0, std::memory_order_relaxed);
 }
 
+void PDSCH_Generator::setRowPatterns(bool withData) {
+    const int period = DmrsConfigType == 1 ? 4 : 6;
+    const int second = DmrsConfigType == 1 ? 2 : 1;
+    for (auto& row : rows_)
+        for (int j = 0; j < 12; ++j) {
+            auto& action = row.pattern[static_cast<std::size_t>(j)];
+            const DmrsPlace place = dmrsPlace(j, row.groupOffset, period, second);
+            if (place.u1 || place.u2) {
+                action = static_cast<signed char>((place.u1 ? 0 : 1) + 2 * place.m);
+                continue;
+            }
+            bool reserved = false;
+            if (CdmGroups >= 2)
+                for (int g = 0; g < CdmGroups; ++g) {
+                    const int w = j - g * DmrsConfigType;
+                    reserved = reserved || w % period == 0 || (w - second) % period == 0;
+                }
+            action = reserved ? kPatternReserved : withData ? kPatternData : kPatternNothing;
+        }
+}
+
 inline void PDSCH_Generator::mapElement(const ElementPlace& e, bool precoded) {
+    bool took = false;
+    for (std::size_t r = 0; r < rows_.size(); ++r) took = mapElementRow(e, r, precoded) || took;
+    if (precoded && took) ++commonRead_;
+}
+
+// One row's part of mapElement; true when the row took a data value.
+inline bool PDSCH_Generator::mapElementRow(const ElementPlace& e, std::size_t r, bool precoded) {
     const int period = DmrsConfigType == 1 ? 4 : 6;
     const int second = DmrsConfigType == 1 ? 2 : 1;
     bool took = false;
-    for (std::size_t r = 0; r < rows_.size(); ++r) {
-        MappedRow& row = rows_[r];
-        int& o = row.occupancy[e.at];
-        complex& value = row.values[e.at];
-        if (e.isDmrs) {
-            // A precoded element carries every port whose CDM group covers it; otherwise the
-            // row's own port decides.
-            bool covered = false;
-            if (precoded) {
-                for (int p : Ports) {
-                    const DmrsPlace place = dmrsPlace(e.re, portGroupOffset(p), period, second);
-                    covered = covered || place.u1 || place.u2;
+    MappedRow& row = rows_[r];
+    int& o = row.occupancy[e.at];
+    complex& value = row.values[e.at];
+    if (e.isDmrs) {
+        // A precoded element carries every port whose CDM group covers it; otherwise the
+        // row's own port decides.
+        bool covered = false;
+        if (precoded) {
+            for (int p : Ports) {
+                const DmrsPlace place = dmrsPlace(e.re, portGroupOffset(p), period, second);
+                covered = covered || place.u1 || place.u2;
+            }
+        } else {
+            const DmrsPlace place = dmrsPlace(e.re, row.groupOffset, period, second);
+            covered = place.u1 || place.u2;
+        }
+        if (!covered) {
+            if (CdmGroups >= 2)
+                for (int g = 0; g < CdmGroups; ++g) {
+                    const int w = e.re - g * DmrsConfigType;
+                    if ((w % period == 0 || (w - second) % period == 0) && (precoded ? o == 0 : freeOrReserved(o)))
+                        o = kCdmReserved;
                 }
-            } else {
-                const DmrsPlace place = dmrsPlace(e.re, row.groupOffset, period, second);
-                covered = place.u1 || place.u2;
-            }
-            if (!covered) {
-                if (CdmGroups >= 2)
-                    for (int g = 0; g < CdmGroups; ++g) {
-                        const int w = e.re - g * DmrsConfigType;
-                        if ((w % period == 0 || (w - second) % period == 0) && (precoded ? o == 0 : freeOrReserved(o)))
-                            o = kCdmReserved;
-                    }
-            } else if (!isSsb(o)) {
-                complex v;
-                if ((precoded ? o == 0 : freeOrReserved(o)) && dmrsPortValue(e, r, precoded, v)) value = v * DmrsAmplitude;
-                o = kDmrs;
-            }
-        }
-        if (e.ptrsRb) {
-            for (int q : PtrsPortList) {
-                if ((e.re - PtrsReInRb[static_cast<std::size_t>(q)]) % 12 != 0 || !freeOrReserved(o)) continue;
-                const std::size_t i = static_cast<std::size_t>((e.prb - LowestPrb) * PtrsPerRb +
-                                                               2 * PtrsCombIndex[static_cast<std::size_t>(q)] +
-                                                               PtrsPhaseIndex[static_cast<std::size_t>(q)]);
-                if ((q == row.port || PtrsMapAll) && i < PtrsBase.size()) value = PtrsBase[i] * PtrsAmplitude;
-                o = kPtrs;
-            }
-        }
-        if (e.isData) {
-            if (o == 0) {
-                complex v;
-                if (dataPortValue(r, precoded, v)) value = v * DataAmplitude;
-                o = kData;
-                took = true;
-            } else if (o != kDmrs && o != kPtrs && o != kCdmReserved && !isSsb(o)) {
-                o = kData;
-            }
+        } else if (!isSsb(o)) {
+            complex v;
+            if ((precoded ? o == 0 : freeOrReserved(o)) && dmrsPortValue(e, r, precoded, v)) value = v * DmrsAmplitude;
+            o = kDmrs;
         }
     }
-    if (precoded && took) ++commonRead_;
+    if (e.ptrsRb) {
+        for (int q : PtrsPortList) {
+            if ((e.re - PtrsReInRb[static_cast<std::size_t>(q)]) % 12 != 0 || !freeOrReserved(o)) continue;
+            const std::size_t i = static_cast<std::size_t>((e.prb - LowestPrb) * PtrsPerRb +
+                                                           2 * PtrsCombIndex[static_cast<std::size_t>(q)] +
+                                                           PtrsPhaseIndex[static_cast<std::size_t>(q)]);
+            if ((q == row.port || PtrsMapAll) && i < PtrsBase.size()) value = PtrsBase[i] * PtrsAmplitude;
+            o = kPtrs;
+        }
+    }
+    if (e.isData) {
+        if (o == 0) {
+            complex v;
+            if (dataPortValue(r, precoded, v)) value = v * DataAmplitude;
+            o = kData;
+            took = true;
+        } else if (o != kDmrs && o != kPtrs && o != kCdmReserved && !isSsb(o)) {
+            o = kData;
+        }
+    }
+    return took;
 }
 
 bool PDSCH_Generator::dmrsPortValue(const ElementPlace& e, std::size_t r, bool precoded, complex& value) const {

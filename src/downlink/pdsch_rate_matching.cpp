@@ -165,7 +165,8 @@ void PDSCH_Generator::CalculateRateMathingParameters(int frame, int subframe, in
         if (!CodingOn) cw.CodedBits.assign(static_cast<std::size_t>(g), 0);
         // Blocks left out (CBG) keep coded bits 0.
         cw.CodedSymbols.assign(static_cast<std::size_t>((g + cw.Qm - 1) / cw.Qm), 0);
-        cw.PnWords.resize(static_cast<std::size_t>((g + 63) / 64));
+        // Scrambling bits of earlier slots stay: the sequence is the same while cInit is.
+        if (cw.PnWords.size() < static_cast<std::size_t>((g + 63) / 64)) cw.PnWords.resize(static_cast<std::size_t>((g + 63) / 64));
         // Generate writes every symbol of every layer.
         cw.Layers.resize(static_cast<std::size_t>(l));
         for (auto& layer : cw.Layers) layer.resize(static_cast<std::size_t>(r));

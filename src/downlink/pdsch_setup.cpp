@@ -11,6 +11,7 @@
 #include "coding/transport_block_size.h"
 #include "common/failure.h"
 #include "common/list_text.h"
+#include "common/packed_bits.h"
 #include "downlink/pdsch_generator.h"
 
 namespace Orvalis_NR {
@@ -421,6 +422,9 @@ void PDSCH_Generator::buildCodeWords(NRCarrier* carrier) {
         cw.CbCrc.assign(24, 0);
         cw.CbBits.assign(static_cast<std::size_t>(cw.K), 0);
         cw.EncoderOut.assign(static_cast<std::size_t>(cw.N), 0);
+        cw.TbWords.assign(packedWords(static_cast<std::size_t>(cw.TbWithCrcBits)) + 1, 0);
+        cw.CbWords.assign(packedWords(static_cast<std::size_t>(cw.K)) + 1, 0);
+        cw.DWords.assign(packedWords(static_cast<std::size_t>(cw.N)) + 1, 0);
         cw.PerBlockE.assign(static_cast<std::size_t>(cw.Blocks), 0);
     }
 }

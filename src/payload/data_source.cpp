@@ -7,6 +7,8 @@
 #include <iterator>
 #include <stdexcept>
 
+#include "common/packed_bits.h"
+
 namespace Orvalis_NR {
 
 namespace {
@@ -152,6 +154,64 @@ void DataSourceBlock::Init(std::vector<char> bits) {
     length = static_cast<int>(block.size());
     position = 0;
     generating = false;
+    packed_.clear();
+    const bool binary = std::all_of(block.begin(), block.end(), [](char b) { return b == 0 || b == 1; });
+    if (!binary || block.empty()) return;
+    // Bits [0, length + 64) of the periodic stream, plus one spare word for the reads.
+    const std::size_t total = block.size() + 64;
+    packed_.assign(packedWords(total) + 1, 0);
+    for (std::size_t at = 0; at < total;) {
+        const std::size_t run = std::min(block.size(), total - at);
+        std::vector<std::uint64_t> piece(packedWords(run) + 1);
+        packBits(block.data(), run, piece.data());
+        copyBits(packed_.data(), at, piece.data(), 0, run);
+        at += run;
+    }
+}
+
+void DataSourceBlock::checkRequest(int count) const {
+    if (count < 0)
+        throw std::out_of_range("DataSourceBlock::GetOneFrame: count " + std::to_string(count) +
+                                " is negative");
+    if (generating) return;
+    if (position < 0 || (length > 0 && position >= length))
+        throw std::out_of_range("DataSourceBlock::GetOneFrame: position " +
+                                std::to_string(position) + " outside a block of " +
+                                std::to_string(length) + " bits");
+    if (length <= 0 && count > 0)
+        throw std::invalid_argument(
+            "DataSourceBlock::GetOneFrame: " + std::to_string(count) +
+            " bits asked of an empty block (PatternBits or UserFile holds no bits)");
+}
+
+bool DataSourceBlock::GetPackedFrame(std::uint64_t* words, int count) {
+    checkRequest(count);
+    if (count == 0) return true;
+    if (generating) {
+        generator.Generate(generated_, count);
+        if (std::any_of(generated_.begin(), generated_.begin() + count, [](char b) { return b != 0 && b != 1; }))
+            return false;  // never for a PN register; kept for the contract
+        packBits(generated_.data(), static_cast<std::size_t>(count), words);
+        return true;
+    }
+    if (packed_.empty()) return false;
+    // Word w starts at stream bit position + 64 w, which lies in the block modulo its length;
+    // the periodic copy makes each word one unaligned read.
+    const std::size_t n = static_cast<std::size_t>(count);
+    const std::size_t period = static_cast<std::size_t>(length);
+    const std::uint64_t* from = packed_.data();
+    std::size_t at = static_cast<std::size_t>(position);
+    const std::size_t whole = packedWords(n);
+    for (std::size_t w = 0; w < whole; ++w) {
+        const unsigned shift = static_cast<unsigned>(at % 64);
+        const std::uint64_t* q = from + at / 64;
+        words[w] = shift == 0 ? q[0] : (q[0] >> shift) | (q[1] << (64 - shift));
+        at += 64;
+        at = period >= 64 ? (at >= period ? at - period : at) : at % period;
+    }
+    if (n % 64 != 0) words[whole - 1] &= (std::uint64_t{1} << (n % 64)) - 1;
+    position = static_cast<int>((static_cast<std::size_t>(position) + n) % period);
+    return true;
 }
 
 template <typename T>

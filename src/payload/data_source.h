@@ -1,6 +1,7 @@
 #pragma once
 // Payload bit sources of the channels: a PayloadData setting turned into an endless stream.
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
@@ -20,6 +21,11 @@ class DataSource {
     /// The next `count` bits into the start of `bits`, which holds at least `count` elements.
     virtual void GetOneFrame(std::vector<int>& bits, int count) { (void)bits, (void)count; }
     virtual void GetOneFrame(std::vector<char>& bits, int count) { (void)bits, (void)count; }
+    /// The next `count` bits packed, first bit in bit 0 of words[0], into `words`, which holds
+    /// at least (count + 63) / 64 words; bits past `count` in the last word are cleared. False,
+    /// drawing nothing, when the source holds values other than 0 and 1: those go through
+    /// GetOneFrame as they are.
+    virtual bool GetPackedFrame(std::uint64_t* words, int count) { (void)words, (void)count; return false; }
     /// Back to the first bit.
     virtual void Reset() {}
 
@@ -40,6 +46,9 @@ class DataSourceBlock : public DataSource {
     /// negative, std::invalid_argument when bits are asked of an empty block.
     void GetOneFrame(std::vector<int>& bits, int count) override;
     void GetOneFrame(std::vector<char>& bits, int count) override;
+    /// The same bits as GetOneFrame, read from a packed copy of the block (PN31 packs what its
+    /// generator gives). Throws as GetOneFrame does.
+    bool GetPackedFrame(std::uint64_t* words, int count) override;
     void Reset() override;
 
     int length = 0;
@@ -51,7 +60,11 @@ class DataSourceBlock : public DataSource {
   private:
     template <typename T>
     void nextBits(std::vector<T>& bits, int count);
+    void checkRequest(int count) const;
     std::vector<char> generated_;  // one request of the PN31 generator
+    /// The block packed and continued periodically for one word past its end, so that the 64
+    /// bits from any position are one read; empty when the block holds other values than 0, 1.
+    std::vector<std::uint64_t> packed_;
 };
 
 /// Bits of a stored PN sequence of `degree` (PN9: 511, PN15: 32767, PN23: 0x7fffff bits).

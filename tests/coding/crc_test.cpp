@@ -51,12 +51,12 @@ std::uint64_t valueOf(const BitSequence& crc) {
 
 class CrcPolynomial : public ::testing::TestWithParam<PolyCase> {};
 
-// The table-driven selector and the raw register (table path from 5000 bits) against the
-// bit-serial division; ones stored as 0xFF bytes and bits past n must not change the check.
+// The table-driven selector, the raw register (table path from 5000 bits) and the packed
+// form (preset 0) against the bit-serial division; ones stored as 0xFF bytes and bits past n must not change the check.
 TEST_P(CrcPolynomial, MatchesBitSerialDivisionAndLeavesZeroAfterItsCheck) {
     const PolyCase p = GetParam();
     std::mt19937 rng(17u + static_cast<unsigned>(p.type));
-    for (int n : {1, 7, 8, 9, 63, 64, 65, 1000, 5000, 8448}) {
+    for (int n : {1, 7, 8, 9, 63, 64, 65, 71, 127, 1000, 5000, 8448}) {
         const BitSequence data = randomBits(static_cast<std::size_t>(n), rng);
         BitSequence noisy = concat(data, randomBits(5, rng));
         for (auto& b : noisy) b = static_cast<char>(b ? -1 : 0);
@@ -71,6 +71,12 @@ TEST_P(CrcPolynomial, MatchesBitSerialDivisionAndLeavesZeroAfterItsCheck) {
                 noisy.data(), raw.data());
             EXPECT_EQ(valueOf(raw), expected) << "raw n=" << n << " preset=" << preset;
         }
+        // The packed form over the same bits, its words dirty past n.
+        std::vector<std::uint64_t> words((static_cast<std::size_t>(n) + 63) / 64 + 1, ~std::uint64_t{0});
+        for (int i = 0; i < n; ++i)
+            if (!data[static_cast<std::size_t>(i)]) words[static_cast<std::size_t>(i / 64)] &= ~(std::uint64_t{1} << (i % 64));
+        EXPECT_EQ(PackedCrc(p.type, words.data(), static_cast<std::size_t>(n)), referenceRemainder(p, data, 0))
+            << "packed n=" << n;
         // Data followed by its own check leaves a zero remainder.
         BitSequence crc(static_cast<std::size_t>(p.length)), check(crc.size(), 1);
         ASSERT_TRUE(NR_CRC(p.type, n, data, crc));

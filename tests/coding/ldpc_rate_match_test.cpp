@@ -13,6 +13,7 @@
 
 #include "coding/ldpc_encoder.h"
 #include "coding/ldpc_symbol_rate_match.h"
+#include "common/packed_bits.h"
 #include "test_support.h"
 #include "vector_file.h"
 
@@ -84,7 +85,8 @@ INSTANTIATE_TEST_SUITE_P(AllRvAndQm, LdpcRateMatchDirect,
 class LdpcSymbolRateMatchDirect : public ::testing::TestWithParam<std::tuple<int, int, int>> {};
 
 // Fillers inside and at the end of limited buffers, k0 inside the filler run, outputs of
-// lengths that are not whole words, shorter than the buffer and wrapping it.
+// lengths that are not whole words, shorter than the buffer and wrapping it; int and packed
+// buffers alike.
 TEST_P(LdpcSymbolRateMatchDirect, SymbolsCarryTheInterleavedBits) {
     const auto [bg, rv, qm] = GetParam();
     const int z = bg == 0 ? 26 : 36;
@@ -98,6 +100,10 @@ TEST_P(LdpcSymbolRateMatchDirect, SymbolsCarryTheInterleavedBits) {
         std::vector<int> d(static_cast<std::size_t>(encoder.N));
         ASSERT_TRUE(encoder.Run(info, d));
         const int n = encoder.N;
+        std::vector<std::uint64_t> packed((n + 63) / 64);
+        Orvalis_NR::packBits(d.data(), d.size(), packed.data());
+        for (int i = 0; i < n; ++i)
+            if (d[static_cast<std::size_t>(i)] == -2) packed[i / 64] &= ~(std::uint64_t{1} << (i % 64));
         for (int ncb : {n, encoder.K - 2 * z - 1, kPrime - 2 * z + 3}) {
             for (int symbols : {1, 7, 8, 9, 333, (2 * ncb) / qm + 5}) {
                 const int e = symbols * qm;
@@ -114,6 +120,12 @@ TEST_P(LdpcSymbolRateMatchDirect, SymbolsCarryTheInterleavedBits) {
                     ASSERT_EQ(out[static_cast<std::size_t>(j)], expected) << "symbol " << j;
                 }
                 EXPECT_EQ(out.back(), 0xFFFF);  // nothing past the last symbol
+                // The packed buffer, fillers 0 as the packed encoder leaves them.
+                const Orvalis_NR::LdpcPackedCircularBuffer packedBuffer{packed.data(), ncb, geometry.K0, kPrime - 2 * z,
+                                                                        encoder.K - 2 * z};
+                std::vector<std::uint16_t> fromPacked(out.size(), 0xFFFF);
+                fast.run(packedBuffer, e, qm, fromPacked.data());
+                EXPECT_EQ(fromPacked, out);
             }
         }
     }

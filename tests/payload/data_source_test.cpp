@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <fstream>
 #include <string>
 #include <vector>
@@ -81,6 +82,50 @@ INSTANTIATE_TEST_SUITE_P(Types, PnPayload,
                                            PnCase{PayloadDataType::PN15, 15, 14, 32767},
                                            PnCase{PayloadDataType::PN23, 23, 18, 0x7fffff},
                                            PnCase{PayloadDataType::PN31, 31, 28, 0x7fffffff}));
+
+// Packed draws hand out the bits the per-bit draws give, interleaved with them on one source:
+// odd lengths, word boundaries, wraps of the short periods (several within one word for a
+// tiny pattern) and a request longer than the block.
+TEST(DataSource, PackedDrawsFollowTheBitDraws) {
+    struct Case {
+        std::shared_ptr<PayloadData> settings;
+        std::vector<int> counts;
+    };
+    const std::vector<Case> cases = {
+        {payload(PayloadDataType::PN9), {63, 64, 65, 448, 511, 1, 1030, 7, 3000}},
+        {payload(PayloadDataType::PN15), {100, 32600, 640, 9}},
+        {payload(PayloadDataType::PN23), {8424, 65, 129, 450984}},
+        {payload(PayloadDataType::PN31), {40, 5, 1000, 64}},
+        {payload(PayloadDataType::Pattern, "10011"), {3, 64, 130, 1}},
+        {payload(PayloadDataType::Pattern, "PN23(5:104, 300:440)"), {70, 241, 500}},
+    };
+    for (const auto& c : cases) {
+        DataSourceBlock packed, plain;
+        packed.Init(c.settings);
+        plain.Init(c.settings);
+        for (std::size_t k = 0; k < 2 * c.counts.size(); ++k) {
+            const int count = c.counts[k % c.counts.size()];
+            const std::vector<char> expected = draw(plain, count);
+            if (k % 3 == 2) {  // a per-bit draw on the packed source too
+                EXPECT_EQ(draw(packed, count), expected);
+                continue;
+            }
+            std::vector<std::uint64_t> words((static_cast<std::size_t>(count) + 63) / 64, ~std::uint64_t{0});
+            ASSERT_TRUE(packed.GetPackedFrame(words.data(), count));
+            for (int i = 0; i < 64 * static_cast<int>(words.size()); ++i)
+                ASSERT_EQ((words[static_cast<std::size_t>(i / 64)] >> (i % 64)) & 1u,
+                          i < count ? static_cast<unsigned>(expected[static_cast<std::size_t>(i)]) : 0u)
+                    << "draw " << k << " bit " << i;
+        }
+        EXPECT_EQ(packed.position, plain.position);
+    }
+    // Digits other than 0 and 1 have no packed form and draw nothing.
+    DataSourceBlock digits;
+    digits.Init(payload(PayloadDataType::Pattern, "0120"));
+    std::uint64_t word = 0;
+    EXPECT_FALSE(digits.GetPackedFrame(&word, 3));
+    EXPECT_EQ(digits.position, 0);
+}
 
 TEST(DataSource, RequestsOfTheBlockLengthAndLongerGoBitByBit) {
     DataSourceBlock source;
