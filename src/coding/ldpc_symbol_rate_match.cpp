@@ -53,7 +53,7 @@ void interleave(const unsigned char* e, int rows, std::uint16_t* symbols) {
             const std::size_t at = static_cast<std::size_t>(i) * static_cast<std::size_t>(rows) + static_cast<std::size_t>(j);
             const __m128i row = _mm_set1_epi16(static_cast<short>(bits16(e, at)));
             const __m128i bit = _mm_min_epu8(_mm_and_si128(row, laneBit), one);
-            acc = _mm_or_si128(acc, _mm_slli_epi16(bit, i));
+            acc = _mm_or_si128(acc, _mm_sll_epi16(bit, _mm_cvtsi32_si128(i)));
         }
         _mm_storeu_si128(reinterpret_cast<__m128i*>(symbols + j), _mm_and_si128(acc, lowByte));
         _mm_storeu_si128(reinterpret_cast<__m128i*>(symbols + j + 8), _mm_srli_epi16(acc, 8));

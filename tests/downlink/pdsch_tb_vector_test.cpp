@@ -82,7 +82,9 @@ TEST_P(PdschTransportBlockVector, CodedAndScrambledBitsEqualTheVector) {
     for (int x : cw.PerBlockE) e += (e.empty() ? "" : ",") + std::to_string(x);
     EXPECT_EQ(e, v.values.at("E_list"));
     std::string tb, coded, scrambled;
-    for (int i = 0; i < a; ++i) tb += static_cast<char>('0' + cw.TbBits[static_cast<std::size_t>(i)]);
+    std::vector<char> tbBits;
+    cw.appendTransportBlock(tbBits);
+    for (int i = 0; i < a && i < static_cast<int>(tbBits.size()); ++i) tb += static_cast<char>('0' + tbBits[static_cast<std::size_t>(i)]);
     // Coded bits travel as symbols of Qm bits and the scrambling sequence as packed words.
     for (std::size_t k = 0; k < static_cast<std::size_t>(g); ++k) {
         const unsigned bit = (cw.CodedSymbols[k / static_cast<std::size_t>(qm)] >> (k % static_cast<std::size_t>(qm))) & 1u;
