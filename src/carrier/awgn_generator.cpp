@@ -9,9 +9,17 @@
 #include "dsp/sinc_low_pass.h"
 #include "dsp/ziggurat_normal.h"
 #include "common/failure.h"
+#include "common/large_buffer.h"
 #include "common/sample_rate_guard.h"
 
 namespace Orvalis_NR {
+
+namespace {
+
+// Samples of noise drawn before they are filtered: about a megabyte, rounded to filter blocks.
+constexpr int kNoiseChunk = 1 << 16;
+
+}  // namespace
 
 void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWaveformSettings& waveform, int totalSamples,
                              int) {
@@ -42,16 +50,23 @@ void AwgnGenerator::InitAwgn(Models::Nr5g::NRCarrier&, Models::Nr5g::NR5GWavefor
     const auto design = Generate_SincLowPass(x, 1024, 1, true);
     std::vector<std::complex<double>> coefficients(design.begin(), design.end());
     noiseFilters.clear();
-    for (int a = 0; a < numberOfAntennas; ++a) noiseFilters.push_back(FilterCreator::createForFrames(coefficients));
+    int block = 1;
+    for (int a = 0; a < numberOfAntennas; ++a) {
+        auto filter = FilterCreator::createForFrames(coefficients);
+        block = filter->blockSize;
+        noiseFilters.push_back(std::move(filter));
+    }
 
     frameLength = std::min(static_cast<int>(rate) / 100, totalSamples);
     const auto rows = static_cast<std::size_t>(std::max(numberOfAntennas, 0));
-    const std::vector<std::complex<double>> zeros(static_cast<std::size_t>(std::max(frameLength, 0)));
-    currentSamples.assign(rows, zeros);
-    previousSamples.assign(rows, zeros);
-    rawNoise.assign(rows, zeros);
-    currentMarkers.assign(rows, std::vector<char>(zeros.size()));
-    previousMarkers.assign(rows, std::vector<char>(zeros.size()));
+    const auto length = static_cast<std::size_t>(std::max(frameLength, 0));
+    assignZeroedRows(currentSamples, rows, length);
+    assignZeroedRows(previousSamples, rows, length);
+    // Whole filter blocks per chunk: the filter then cuts the frame as it would in one call.
+    chunkLength = std::max(1, kNoiseChunk / block) * block;
+    assignZeroed(rawNoise, std::min(length, static_cast<std::size_t>(chunkLength)));
+    assignZeroedRows(currentMarkers, rows, length);
+    assignZeroedRows(previousMarkers, rows, length);
     const int lines[4] = {static_cast<int>(waveform.Marker1->getValue()), static_cast<int>(waveform.Marker2->getValue()),
                           static_cast<int>(waveform.Marker3->getValue()), static_cast<int>(waveform.Marker4->getValue())};
     setMarkerLines(lines);
@@ -68,15 +83,19 @@ void AwgnGenerator::GoAwgn(int frame, int, bool secondPass, bool noiseOnly) {
     }
     // Frames 1 and on of the first pass keep the default seed and so repeat the same noise.
 
-    for (std::size_t a = 0; a < rawNoise.size(); ++a) {
-        auto& raw = rawNoise[a];
-        for (int i = 0; i < frameLength; ++i) {
-            const double inPhase = normal(engine) * sigma;
-            const double quadrature = normal(engine) * sigma;
-            raw[static_cast<std::size_t>(i)] = {inPhase, quadrature};
-        }
+    for (std::size_t a = 0; a < currentSamples.size(); ++a) {
         previousSamples[a].swap(currentSamples[a]);
-        if (frameLength > 0) noiseFilters[a]->filter(raw.data(), frameLength, currentSamples[a].data(), frameLength);
+        auto* out = currentSamples[a].data();
+        // A chunk at a time, drawn and filtered while it is in cache.
+        for (int done = 0; done < frameLength; done += chunkLength) {
+            const int length = std::min(chunkLength, frameLength - done);
+            for (int i = 0; i < length; ++i) {
+                const double inPhase = normal(engine) * sigma;
+                const double quadrature = normal(engine) * sigma;
+                rawNoise[static_cast<std::size_t>(i)] = {inPhase, quadrature};
+            }
+            noiseFilters[a]->filter(rawNoise.data(), length, out + done, length);
+        }
     }
 
     // Frame start (and waveform start in frame 0) on the first sample; RF ALC and blanking on
@@ -84,11 +103,12 @@ void AwgnGenerator::GoAwgn(int frame, int, bool secondPass, bool noiseOnly) {
     const int allSamples = noiseOnly ? 12 : 0;
     const char firstByte = markerByte((frame == 0 ? 3 : 2) | allSamples);
     const char otherBytes = markerByte(allSamples);
+    if (frameLength < 1) return;
     for (std::size_t a = 0; a < currentMarkers.size(); ++a) {
-        for (int i = 0; i < frameLength; ++i) {
-            const char byte = i == 0 ? firstByte : otherBytes;
-            currentMarkers[a][static_cast<std::size_t>(i)] |= byte;
-            previousMarkers[a][static_cast<std::size_t>(i)] |= byte;
+        for (auto* row : {&currentMarkers[a], &previousMarkers[a]}) {
+            (*row)[0] = static_cast<char>((*row)[0] | firstByte);
+            if (otherBytes != 0)
+                for (int i = 1; i < frameLength; ++i) (*row)[static_cast<std::size_t>(i)] |= otherBytes;
         }
     }
 }

@@ -10,7 +10,7 @@
 
 namespace Orvalis_NR {
 
-class Filter;
+class BlockFilter;
 
 class AwgnGenerator : public NR5GCarrierGenerator {
 public:
@@ -19,12 +19,13 @@ public:
                   int startSample);
     void GoAwgn(int frame, int numberOfFrames, bool secondPass, bool noiseOnly);
 
-    std::vector<std::vector<std::complex<double>>> rawNoise;
-    std::vector<std::shared_ptr<Filter>> noiseFilters;
+    std::vector<std::complex<double>> rawNoise;  // one chunk of unfiltered noise
+    std::vector<std::shared_ptr<BlockFilter>> noiseFilters;
     Models::Nr5g::NR5GWaveformSettings* settings = nullptr;
     double sigma = 0.0;
     int numberOfAntennas = 0;
     int frameLength = 0;
+    int chunkLength = 1;  // samples drawn and filtered at a time
     unsigned int seed = 0;
 };
 

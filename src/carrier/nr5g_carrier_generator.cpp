@@ -6,6 +6,7 @@
 #include <numeric>
 
 #include "common/failure.h"
+#include "common/large_buffer.h"
 #include "common/sample_rate_guard.h"
 #include "downlink/pdsch_generator.h"
 
@@ -61,12 +62,14 @@ void NR5GCarrierGenerator::Init(Models::Nr5g::NRCarrier& carrierSettings, Models
                  "SampleRateAuto " + numberText(rate));
 
     const auto rows = static_cast<std::size_t>(numberOfAntennas);
-    currentSamples.assign(rows, std::vector<std::complex<double>>(static_cast<std::size_t>(outputLength)));
-    previousSamples = currentSamples;
-    currentMarkers.assign(rows, std::vector<char>(static_cast<std::size_t>(outputLength)));
-    previousMarkers = currentMarkers;
-    sampleMarkers.assign(rows, std::vector<int>(static_cast<std::size_t>(frameLength)));
-    frameSamples.assign(rows, std::vector<std::complex<double>>(static_cast<std::size_t>(frameLength)));
+    const auto kept = static_cast<std::size_t>(outputLength);
+    const auto frame = static_cast<std::size_t>(frameLength);
+    assignZeroedRows(currentSamples, rows, kept);
+    assignZeroedRows(previousSamples, rows, kept);
+    assignZeroedRows(currentMarkers, rows, kept);
+    assignZeroedRows(previousMarkers, rows, kept);
+    assignZeroedRows(sampleMarkers, rows, frame);
+    assignZeroedRows(frameSamples, rows, frame);
 
     frequencyOffset = carrierSettings.FrequencyOffset->getValue();
     powerBoosting = carrierSettings.PowerBoosting->getValue();
@@ -179,8 +182,7 @@ void NR5GCarrierGenerator::Go(int frame, int numberOfFrames, bool secondPass) {
         if (cancelled.load(std::memory_order_relaxed)) break;
         auto& numerology = numerologies[static_cast<std::size_t>(i)];
         if (!numerology.hasValidChannel) continue;
-        for (auto& row : frameSamples) std::fill(row.begin(), row.end(), std::complex<double>{});
-        numerology.Go(frame, numberOfFrames, frameSamples, sampleMarkers);
+        numerology.Go(frame, numberOfFrames, frameSamples, sampleMarkers);  // writes every sample
         addNumerology(numerology, firstWithContent);
         firstWithContent = false;
     }

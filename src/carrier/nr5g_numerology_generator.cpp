@@ -11,6 +11,7 @@
 #include "downlink/prs_generator.h"
 #include "dsp/sinc_low_pass.h"
 #include "common/failure.h"
+#include "common/large_buffer.h"
 #include "common/list_text.h"
 #include "common/sample_rate_guard.h"
 #include "common/log.h"
@@ -121,11 +122,14 @@ void NR5GNumerologyGenerator::Init(Models::Nr5g::NR5GWaveformSettings& waveform,
     modulator.centred = owner.WindowingMethod->getValue() == WindowingMethod::CenteredAtSymbolBoundary ? 1 : 0;
     modulator.oversampling = 1;
     modulator.Init(fftSize, cpLengths, symbolsPerFrame, owner.DCPunctured->getValue(), numberOfAntennas);
+    modulatedLength = 0;
+    for (int s = 0; s < symbolsPerFrame; ++s)
+        modulatedLength += static_cast<std::size_t>(fftSize + cpLengths[static_cast<std::size_t>(s) % cpLengths.size()]);
     const auto rows = static_cast<std::size_t>(numberOfAntennas);
     const auto elements = static_cast<std::size_t>(symbolsPerFrame) * static_cast<std::size_t>(fftSize);
-    grid.assign(rows, std::vector<std::complex<double>>(elements));
-    occupancy.assign(rows, std::vector<int>(elements));
-    symbolMarks.assign(rows, std::vector<int>(static_cast<std::size_t>(symbolsPerFrame)));
+    assignZeroedRows(grid, rows, elements);
+    assignZeroedRows(occupancy, rows, elements);
+    assignZeroedRows(symbolMarks, rows, static_cast<std::size_t>(symbolsPerFrame));
     storesClear = true;  // assigned zero just now: the first frame need not clear them again
     Log("End Init OFDM");
 
@@ -456,7 +460,10 @@ void NR5GNumerologyGenerator::deriveMarkers(const std::vector<std::vector<int>>&
 
 void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::complex<double>>>& output,
                                  std::vector<std::vector<int>>& sampleMarkers) {
-    if (!hasValidChannel) return;
+    if (!hasValidChannel) {
+        for (auto& row : output) std::fill(row.begin(), row.end(), std::complex<double>{});
+        return;
+    }
     for (auto& row : symbolMarks) std::fill(row.begin(), row.end(), 0);
     if (takeCancel()) return;
     if (!storesClear) {
@@ -504,7 +511,10 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     if (!pdschGenerators.empty()) Log("End Generate PDSCH");
     if (takeCancel()) return;
     if (!mapCsiRs(frame, true, anyMapped)) return;
-    if (!anyMapped) return;
+    if (!anyMapped) {
+        for (auto& row : output) std::fill(row.begin(), row.end(), std::complex<double>{});
+        return;
+    }
 
     Log("Start OFDM");
     const auto phaseMode = settings->PhaseCompensation->getValue();
@@ -515,6 +525,11 @@ void NR5GNumerologyGenerator::Go(int frame, int, std::vector<std::vector<std::co
     blankOutsideWaveform();
     if (takeCancel()) return;
     modulator.Go(grid, output, phaseStep, frame);
+    // The symbols cover the frame but for what the truncated transform and prefix lengths of an
+    // odd sample rate leave over at its end.
+    for (auto& row : output)
+        std::fill(row.begin() + static_cast<std::ptrdiff_t>(std::min(modulatedLength, row.size())), row.end(),
+                  std::complex<double>{});
     Log("End OFDM");
     if (takeCancel()) return;
 

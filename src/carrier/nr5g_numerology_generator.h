@@ -37,8 +37,9 @@ public:
     /// Geometry of numerology `numerology` (0..5, the position of Numerology) at the waveform's
     /// sample rate, and the channels of the carrier that use it.
     void Init(Models::Nr5g::NR5GWaveformSettings& settings, Models::Nr5g::NRCarrier& carrier, int numerology);
-    /// One frame of this numerology into `output` (per antenna, one frame at the waveform rate,
-    /// cleared by the caller) and its marker words ORed into `sampleMarkers`.
+    /// One frame of this numerology into `output` (per antenna, one frame at the waveform rate;
+    /// every sample is written, zero where no symbol lies) and its marker words ORed into
+    /// `sampleMarkers`. A cancelled frame leaves `output` undefined.
     void Go(int frame, int numberOfFrames, std::vector<std::vector<std::complex<double>>>& output,
             std::vector<std::vector<int>>& sampleMarkers);
     /// Reserves the LTE cell reference signals of spectrum sharing in `occupancy`.
@@ -127,6 +128,7 @@ private:
     bool transformPrecoded = false;
     std::vector<std::vector<int>> symbolMarks;  // per antenna, one word per symbol of the frame
     bool storesClear = false;                   // grid and occupancy hold zeros only
+    std::size_t modulatedLength = 0;            // samples the symbols of a frame cover
 };
 
 }  // namespace Orvalis_NR

@@ -11,18 +11,19 @@ namespace {
 // Shortest transform createForFrames uses: below it the per-block copies outweigh the saving.
 constexpr int kShortestFrameTransform = 1024;
 
-// The inverse transform without its 1/N, where `transform` is the library's own; false for any
-// other implementation.
-bool inverseUnscaled(Dft& transform, std::complex<double>* data) {
+// The inverse transform of `in` into `out` without its 1/N, where `transform` is the library's
+// own; false for any other implementation.
+bool inverseUnscaled(Dft& transform, const std::complex<double>* in, std::complex<double>* out) {
     auto* own = dynamic_cast<IppDft*>(&transform);
     if (own == nullptr) return false;
-    auto* values = reinterpret_cast<double*>(data);
+    const auto* from = reinterpret_cast<const double*>(in);
+    auto* to = reinterpret_cast<double*>(out);
     if (own->fftTransform) {
-        own->fftTransform->InverseFFTUnscaled(values, values);
+        own->fftTransform->InverseFFTUnscaled(from, to);
         return true;
     }
     if (own->dftTransform) {
-        own->dftTransform->InverseDFTUnscaled(values, values);
+        own->dftTransform->InverseDFTUnscaled(from, to);
         return true;
     }
     return false;
@@ -91,6 +92,7 @@ void Fir::filter(const std::complex<double>* in, int inLength, std::complex<doub
             for (auto& value : spectrum) value *= scale;
         }
         work.assign(static_cast<std::size_t>(size), {});
+        product.assign(static_cast<std::size_t>(size), {});
         spectrumSize = size;
     }
 
@@ -108,9 +110,11 @@ void Fir::filter(const std::complex<double>* in, int inLength, std::complex<doub
         std::copy(in, in + length, delayLine.end() - length);
     }
 
-    transform->dft(work.data(), work.data());
-    for (int i = 0; i < size; ++i) work[i] *= spectrum[i];
-    if (!spectrumScaled || !inverseUnscaled(*transform, work.data())) transform->idft(work.data(), work.data());
+    // Out of place both ways: FFTW's out-of-place plans are the faster ones at these lengths.
+    transform->dft(work.data(), product.data());
+    for (int i = 0; i < size; ++i) product[i] *= spectrum[i];
+    if (!spectrumScaled || !inverseUnscaled(*transform, product.data(), work.data()))
+        transform->idft(product.data(), work.data());
     std::copy(work.begin(), work.begin() + length, out);
 }
 

@@ -59,6 +59,7 @@ class Fir : public BasicFir {
     std::shared_ptr<Dft> transform;
     std::vector<std::complex<double>> spectrum;  // transform of the zero-padded coefficients
     std::vector<std::complex<double>> work;
+    std::vector<std::complex<double>> product;  // the block's spectrum times the filter's
 
   private:
     int spectrumSize = 0;         // transform size `spectrum` was made for

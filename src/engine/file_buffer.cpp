@@ -35,6 +35,7 @@ FileBuffer& FileBuffer::operator=(FileBuffer&& other) noexcept {
     sampleFileName = std::move(other.sampleFileName);
     sampleScratch = std::move(other.sampleScratch);
     markerScratch = std::move(other.markerScratch);
+    chunkElements = other.chunkElements;
     return *this;
 }
 
@@ -50,8 +51,6 @@ void FileBuffer::Init(const char* path) {
     if (!sampleFile) failWith("FileBuffer::Open file failed.", sampleFileName);
     markerFile = std::fopen(markerFileName.c_str(), "wb+");
     if (!markerFile) failWith("FileBuffer::Open file failed.", markerFileName);
-    sampleScratch.resize(1);
-    markerScratch.resize(1);
 }
 
 void FileBuffer::Reset() {
@@ -140,31 +139,50 @@ void FileBuffer::advance(std::uint64_t count) {
 
 void FileBuffer::Save(std::vector<std::complex<double>>& samples, std::vector<char>& markers, bool writeAll,
                       bool overwriteSamples, bool addSamples, char markerMask, int skip) {
-    const std::uint64_t count = samples.size();
-    if (markers.size() < count) failWith("FileBuffer: marker row shorter than sample row.", sampleFileName);
+    if (markers.size() < samples.size()) failWith("FileBuffer: marker row shorter than sample row.", sampleFileName);
+    Save(samples.data(), markers.data(), samples.size(), writeAll, overwriteSamples, addSamples, markerMask, skip);
+}
+
+// The first carrier writes its rows as they are (writeAll). A later one replaces the samples
+// (overwriteSamples), adds its own from element `skip` on (addSamples), or leaves them, and ORs
+// its markers, through `markerMask`, into those in the file. Read, add and write go a chunk at a
+// time, so that the scratch rows stay small.
+void FileBuffer::Save(const std::complex<double>* samples, const char* markers, std::uint64_t count, bool writeAll,
+                      bool overwriteSamples, bool addSamples, char markerMask, int skip) {
     if (count > totalSamples) failWith("FileBuffer: row longer than the waveform.", sampleFileName);
+    if (count == 0) return;
     if (writeAll) {
-        writeRing(sampleFile, sampleFileName, samples.data(), count);
-        writeRing(markerFile, markerFileName, markers.data(), count);
+        writeRing(sampleFile, sampleFileName, samples, count);
+        writeRing(markerFile, markerFileName, markers, count);
         advance(count);
         return;
     }
-    if (sampleScratch.size() != count) sampleScratch.resize(count);
-    if (markerScratch.size() != count) markerScratch.resize(count);
+    const std::uint64_t chunk = std::max<std::uint64_t>(chunkElements, 1);
+    const std::uint64_t from = static_cast<std::uint64_t>(std::max(skip, 0));
+    for (std::uint64_t done = 0; done < count; done += chunk) {
+        const std::uint64_t length = std::min(chunk, count - done);
+        const std::uint64_t skipHere = from > done ? std::min(from - done, length) : 0;
+        saveChunk(samples + done, markers + done, length, overwriteSamples, addSamples, markerMask, skipHere);
+    }
+}
 
+void FileBuffer::saveChunk(const std::complex<double>* samples, const char* markers, std::uint64_t count,
+                           bool overwriteSamples, bool addSamples, char markerMask, std::uint64_t skip) {
     if (overwriteSamples) {
-        writeRing(sampleFile, sampleFileName, samples.data(), count);
+        writeRing(sampleFile, sampleFileName, samples, count);
     } else if (addSamples) {
+        if (sampleScratch.size() < count) sampleScratch.resize(count);
         readRing(sampleFile, sampleFileName, sampleScratch.data(), count);
-        const std::size_t from = static_cast<std::size_t>(std::clamp<std::int64_t>(skip, 0, static_cast<std::int64_t>(count)));
-        for (std::size_t i = from; i < count; ++i) sampleScratch[i] += samples[i];
+        for (std::uint64_t i = skip; i < count; ++i) sampleScratch[i] += samples[i];
         writeRing(sampleFile, sampleFileName, sampleScratch.data(), count);
     } else {
         seekForwardRing(sampleFile, sampleFileName, count, kSampleBytes);
     }
 
+    if (markerScratch.size() < count) markerScratch.resize(count);
     readRing(markerFile, markerFileName, markerScratch.data(), count);
-    for (std::size_t i = 0; i < count; ++i) markerScratch[i] = static_cast<char>(markerScratch[i] | (markers[i] & markerMask));
+    for (std::uint64_t i = 0; i < count; ++i)
+        markerScratch[i] = static_cast<char>(markerScratch[i] | (markers[i] & markerMask));
     writeRing(markerFile, markerFileName, markerScratch.data(), count);
     advance(count);
 }

@@ -31,6 +31,9 @@ public:
     /// Handles one row at the current position (see file_buffer.cpp).
     void Save(std::vector<std::complex<double>>& samples, std::vector<char>& markers, bool writeAll,
               bool overwriteSamples, bool addSamples, char markerMask, int skip);
+    /// The same for `count` samples and markers read from the two pointers.
+    void Save(const std::complex<double>* samples, const char* markers, std::uint64_t count, bool writeAll,
+              bool overwriteSamples, bool addSamples, char markerMask, int skip);
     void Close();
     /// Removes both files; failures are ignored.
     void Delete();
@@ -44,6 +47,8 @@ public:
     std::string sampleFileName;
     std::vector<std::complex<double>> sampleScratch;
     std::vector<char> markerScratch;
+    /// Elements per read-add-write step: the scratch rows stay this short and in cache.
+    std::uint64_t chunkElements = std::uint64_t{1} << 15;
 
 private:
     template <class T>
@@ -53,6 +58,8 @@ private:
     void seekRelative(std::FILE* file, const std::string& name, std::int64_t elements, long size);
     void seekForwardRing(std::FILE* file, const std::string& name, std::uint64_t count, long size);
     void advance(std::uint64_t count);
+    void saveChunk(const std::complex<double>* samples, const char* markers, std::uint64_t count,
+                   bool overwriteSamples, bool addSamples, char markerMask, std::uint64_t skip);
 };
 
 }  // namespace Orvalis_NR

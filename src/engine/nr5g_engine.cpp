@@ -61,6 +61,24 @@ void requireOpenFiles(int antennas) {
 #endif
 }
 
+// The frame rows of a carrier that has finished, kept for the next carrier and the noise: their
+// set-up then reuses this memory instead of touching fresh pages.
+struct SpareRows {
+    NR5GCarrierGenerator::Rows current, previous, frame;
+    std::vector<std::vector<char>> currentMarkers, previousMarkers;
+    std::vector<std::vector<int>> sampleMarkers;
+
+    /// Gives the kept rows to `generator` and keeps its own; the same call takes them back.
+    void swapWith(NR5GCarrierGenerator& generator) {
+        current.swap(generator.currentSamples);
+        previous.swap(generator.previousSamples);
+        frame.swap(generator.frameSamples);
+        currentMarkers.swap(generator.currentMarkers);
+        previousMarkers.swap(generator.previousMarkers);
+        sampleMarkers.swap(generator.sampleMarkers);
+    }
+};
+
 }  // namespace
 
 WaveformLength ComputeWaveformLength(const NR5GWaveformSettings& settings) {
@@ -249,17 +267,11 @@ void NR5GEngine::runCarrier(NR5GCarrierGenerator& generator, int offset, Compute
     }
 
     // The first half of frame 0, now complete with what came over from the last frame.
-    // Kept from run to run; one per thread, so that engines on two threads do not share it.
-    thread_local std::vector<char> halfMarkers;
     const auto half = generator.currentSamples.empty() ? 0 : generator.currentSamples[0].size() / 2;
-    halfFrame.resize(half);
-    if (halfMarkers.size() != half) halfMarkers.resize(half);
     for (int a = 0; a < numberOfAntennas; ++a) {
-        const auto& samples = generator.currentSamples[static_cast<std::size_t>(a)];
-        const auto& markers = generator.currentMarkers[static_cast<std::size_t>(a)];
-        std::copy(samples.begin(), samples.begin() + static_cast<long>(half), halfFrame.begin());
-        std::copy(markers.begin(), markers.begin() + static_cast<long>(half), halfMarkers.begin());
-        fileBuffers[static_cast<std::size_t>(a)].Save(halfFrame, halfMarkers, false, firstCarrier, true, blankingMask, 0);
+        const auto row = static_cast<std::size_t>(a);
+        fileBuffers[row].Save(generator.currentSamples[row].data(), generator.currentMarkers[row].data(), half, false,
+                              firstCarrier, true, blankingMask, 0);
     }
     firstCarrier = false;
 }
@@ -284,11 +296,13 @@ void NR5GEngine::Go() {
     for (int c = 0; c < numberOfCarriers; ++c) anyEnabled = anyEnabled || carriers->getItem(c)->Enabled->getValue();
     const bool noiseOnly = hasNoise && !anyEnabled;
     bool firstCarrier = true;
+    SpareRows spare;
     try {
         for (int c = 0; c < numberOfCarriers && !cancelled.load(std::memory_order_relaxed); ++c) {
             auto carrier = carriers->getItem(c);
             if (!carrier->Enabled->getValue()) continue;
             auto& generator = carrierGenerators[static_cast<std::size_t>(c)];
+            spare.swapWith(*generator);
             generator->Init(*carrier, *settings, totalSamples, startSample);
             const double offset = settings->SampleRateAuto->getValue() * carrier->TimingOffset->getValue();
             if (!(offset >= 0.0) || offset > totalSamples)
@@ -301,10 +315,12 @@ void NR5GEngine::Go() {
                 if (testVectorGenerator && frame == 0 && !secondPass) testVectorGenerator->GenerateOneFrame(c, frame);
             };
             runCarrier(*generator, static_cast<int>(offset), computeFrame, true, firstCarrier);
+            spare.swapWith(*generator);
             std::lock_guard<std::mutex> lock(generatorsMutex);
             generator.reset();
         }
         if (hasNoise && noiseGenerator && !cancelled.load(std::memory_order_relaxed)) {
+            spare.swapWith(*noiseGenerator);
             {
                 Models::Nr5g::NRCarrier temporary;
                 noiseGenerator->InitAwgn(temporary, *settings, totalSamples, startSample);

@@ -61,7 +61,6 @@ public:
     std::atomic<bool> cancelled{false};
     int totalSamples = 0;
     int startSample = 0;
-    std::vector<std::complex<double>> halfFrame;
 
 private:
     /// Both passes of one carrier (or the noise) into the files.

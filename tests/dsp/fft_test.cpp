@@ -1,11 +1,13 @@
 #include "dsp/fft.h"
 
+#include <fftw3.h>
 #include <gtest/gtest.h>
 
 #include <functional>
 #include <stdexcept>
 #include <string>
 
+#include "dsp/filter.h"
 #include "dsp/ipp_dft.h"
 #include "dsp_oracles.h"
 
@@ -99,6 +101,55 @@ INSTANTIATE_TEST_SUITE_P(Sizes, TransformAgainstDirectSum, ::testing::ValuesIn(t
                              return std::string(kWrappers[info.param.wrapper].name) + "_" +
                                     std::to_string(info.param.size);
                          });
+
+// A host process may have planned or imported FFTW wisdom of its own before it uses the library;
+// FFTW then plans differently. Transforms and frame filters must stay within tolerance of the
+// direct sums either way.
+TEST(TransformWrappers, HostWisdomLeavesResultsWithinTolerance) {
+    constexpr int kLengths[] = {1024, 1536};
+    const Samples taps = randomSamples(65, 3);  // a frame filter of a 1024-point transform
+    const Samples input = randomSamples(3000, 4);
+    const Samples filtered = directConvolution(taps, input);
+    const auto check = [&](const char* when) {
+        for (int n : kLengths) {
+            const Samples x = randomSamples(static_cast<std::size_t>(n), 5u + n);
+            const Samples expected = directDft(x), expectedInverse = directIdft(x);
+            IppDft dft(n);
+            Samples forward(static_cast<std::size_t>(n)), inverse(static_cast<std::size_t>(n)), inPlace = x;
+            dft.dft(x.data(), forward.data());
+            dft.idft(x.data(), inverse.data());
+            dft.dft(inPlace.data(), inPlace.data());
+            EXPECT_LE(maxAbsDifference(forward, expected), tolerance(expected)) << when << ", length " << n;
+            EXPECT_LE(maxAbsDifference(inverse, expectedInverse), tolerance(expectedInverse)) << when << ", length " << n;
+            EXPECT_LE(maxAbsDifference(inPlace, expected), tolerance(expected)) << when << ", length " << n;
+        }
+        Samples output(input.size());
+        Orvalis_NR::FilterCreator::createForFrames(taps)->filter(input.data(), static_cast<int>(input.size()),
+                                                                  output.data(), static_cast<int>(output.size()));
+        EXPECT_LE(maxAbsDifference(output, filtered), tolerance(filtered)) << when;
+    };
+    check("without wisdom");
+
+    // The host measures its own plans of the same lengths (briefly), exports the wisdom, forgets
+    // it and loads it back, as it would from a file.
+    fftw_set_timelimit(0.01);
+    for (int n : kLengths) {
+        fftw_complex* a = fftw_alloc_complex(static_cast<std::size_t>(n));
+        fftw_complex* b = fftw_alloc_complex(static_cast<std::size_t>(n));
+        for (int sign : {FFTW_FORWARD, FFTW_BACKWARD})
+            for (fftw_complex* out : {a, b}) fftw_destroy_plan(fftw_plan_dft_1d(n, a, out, sign, FFTW_MEASURE));
+        fftw_free(a);
+        fftw_free(b);
+    }
+    fftw_set_timelimit(FFTW_NO_TIMELIMIT);
+    char* wisdom = fftw_export_wisdom_to_string();
+    ASSERT_NE(wisdom, nullptr);
+    fftw_forget_wisdom();
+    EXPECT_EQ(fftw_import_wisdom_from_string(wisdom), 1);
+    fftw_free(wisdom);
+    check("with the host's wisdom");
+    fftw_forget_wisdom();  // leave the process as it was
+}
 
 TEST(TransformWrappers, CopiesPlanTheirOwnTransform) {
     FFT original;

@@ -137,13 +137,16 @@ TEST_F(FileBufferTest, RowsWrapAddAndMergeMarkersAsARing) {
     expectFilesMatch(ring, "overwrite");
 }
 
-// Random sequences of the engine's operations against the ring, on rings of several lengths.
+// Random sequences of the engine's operations against the ring, on rings of several lengths,
+// with rows read, added and written back whole and in chunks of a few elements.
 TEST_F(FileBufferTest, RandomOperationsMatchTheRing) {
     std::mt19937 random(20260101);
+    for (std::uint64_t chunk : {std::uint64_t{1} << 15, std::uint64_t{3}})
     for (std::size_t total : {1u, 7u, 64u, 1000u}) {
         FileBuffer buffer;
         buffer.Init(path.c_str());
         buffer.totalSamples = total;
+        buffer.chunkElements = chunk;
         Ring ring(total);
         for (int step = 0; step < 60; ++step) {
             const bool first = step < 15;  // the first carrier writes, later ones add
@@ -166,8 +169,10 @@ TEST_F(FileBufferTest, RandomOperationsMatchTheRing) {
             const std::size_t skip = random() % (count + 1);
             buffer.Save(samples, marks, writeAll, overwrite, add, mask, static_cast<int>(skip));
             ring.save(samples, marks, writeAll, overwrite, add, mask, skip);
-            ASSERT_EQ(buffer.position, ring.position) << "ring " << total << ", step " << step;
-            expectFilesMatch(ring, "ring " + std::to_string(total) + ", step " + std::to_string(step));
+            const std::string where =
+                "ring " + std::to_string(total) + ", chunk " + std::to_string(chunk) + ", step " + std::to_string(step);
+            ASSERT_EQ(buffer.position, ring.position) << where;
+            expectFilesMatch(ring, where);
             if (HasFatalFailure()) return;
         }
     }

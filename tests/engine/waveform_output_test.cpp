@@ -129,9 +129,10 @@ TEST_F(WaveformOutput, DisabledCarriersAreLeftOut) {
 
 TEST_F(WaveformOutput, NoiseOnlyIsTheCircularlyFilteredNoiseWithFullMarkers) {
     // Noise only: the waveform played in a loop is the noise filtered as a circle, so the
-    // filter's spill-over from the last frame lands at the start.
-    constexpr double rate = 3.84e6;
-    constexpr std::size_t frameLength = 38400, n = 2 * frameLength;
+    // filter's spill-over from the last frame lands at the start. A frame is longer than the
+    // stretch of noise drawn and filtered at a time.
+    constexpr double rate = 7.68e6;
+    constexpr std::size_t frameLength = 76800, n = 2 * frameLength;
     auto disabled = cwCarrier();
     disabled["Enabled"] = false;
     auto document = waveform(rate, 2, {disabled});
@@ -160,7 +161,7 @@ TEST_F(WaveformOutput, NoiseOnlyIsTheCircularlyFilteredNoiseWithFullMarkers) {
     }
     const auto taps = Generate_SincLowPass(x, 1024, 1, true);
     double worst = 0.0;
-    for (std::size_t i = 0; i < n; i += 7) {  // every 7th sample keeps the convolution quick
+    for (std::size_t i = 0; i < n; i += 13) {  // every 13th sample keeps the convolution quick
         Sample expected{};
         for (std::size_t k = 0; k < taps.size(); ++k) expected += taps[k] * raw[(i + n - k) % n];
         worst = std::max(worst, std::abs(samples[i] - expected));
